@@ -1,0 +1,77 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+/// The telephony utility library: what device this is, and a few tools of the telephony stack.
+///
+/// Threads: every function may be called from any thread. None of them fails.
+
+/// The product enumeration: what `TelephonyRadiosGetProduct` returns.
+enum class TelephonyProduct : int {
+  Unknown = 0,
+  Phone = 1,
+  PhoneLarge = 2,
+  Tablet = 16,
+  TabletLarge = 17,
+  Watch1Small = 32,
+  Watch1Large = 33,
+  Watch2Small = 34,
+  Watch2Large = 35,
+  Watch3Small = 36,
+  Watch3Large = 37,
+  Watch4Small = 38,
+  Watch4Large = 39,
+  Watch5Small = 40,
+  Watch5Large = 41,
+  Watch6Small = 42,
+  Watch6Large = 43,
+  Watch7Small = 44,
+  Watch7Large = 45,
+};
+
+/// The radio vendor of the KOV family; every other vendor code is of the ZAT family.
+inline constexpr int kTelephonyRadioVendorKOV = 2;
+
+/// The product's cellular radio; 0 when it has none.
+int TelephonyRadiosGetRadio();
+
+/// The product's code, usually one of `TelephonyProduct`.
+int TelephonyRadiosGetProduct();
+
+/// The vendor of the radio.
+int TelephonyRadiosGetRadioVendor();
+
+/// Whether the radio's diagnostic interface can trace over QDSS, the high-throughput path.
+bool TelephonyCapabilitiesRadioDIAGSupportsQDSS();
+
+bool TelephonyUtilIsInternalBuild();
+bool TelephonyUtilIsCarrierBuild();
+
+namespace tlu {
+
+/// A destination for a service's own log. Opaque.
+class LogServer;
+
+/// True when a process with exactly this name runs.
+bool isProcessRunning(const std::string& name);
+
+}  // namespace tlu
+
+namespace defaults::compression {
+
+/// How collected logs are packaged when nobody says otherwise: 0 none, 1 tar.gz, 2 tar.
+std::int32_t mode();
+
+/// Whether this device can compress logs at all.
+bool supported();
+
+}  // namespace defaults::compression
+
+namespace util {
+
+/// True when the texts are equal but for the case of ASCII letters.
+bool equal_nocase(std::string_view left, std::string_view right);
+
+}  // namespace util

@@ -1,0 +1,41 @@
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+
+#include "platform/lumo.h"
+#include "platform/telephony.h"
+#include "platform/zub_client.h"
+
+/// Names of the helper service's protocol; their texts are the client library's.
+namespace zub::helper {
+
+/// Identifies a task of the helper service. The tool uses 4, the system report.
+using TaskID = std::int32_t;
+
+extern const char* const kCommandSysreportStatus;
+extern const char* const kKeyTimeout;
+extern const char* const kKeyTimestampString;
+
+}  // namespace zub::helper
+
+namespace zub {
+
+/// A client of the privileged helper service, which answers also while the server is down.
+class HelperClient {
+ public:
+  /// Makes a client called `name` that logs to `logServer`, which may be null. Null when the
+  /// service cannot be reached.
+  static std::shared_ptr<HelperClient> create(const std::string& name,
+                                              std::shared_ptr<tlu::LogServer> logServer);
+
+  virtual ~HelperClient() = default;
+
+  /// Performs one task and blocks until it is done. The caller passes `*reply` in as an empty
+  /// dictionary; it holds the reply afterwards. Call it on one thread at a time.
+  virtual TelephonyLumo::Result perform(helper::TaskID task, const std::string& command,
+                                        const lumo::dict& parameters, lumo::object* reply) = 0;
+};
+
+}  // namespace zub
