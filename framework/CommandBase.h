@@ -1,0 +1,86 @@
+#pragma once
+
+#include <list>
+#include <map>
+#include <memory>
+#include <string>
+
+#include "platform/dispatch.h"
+
+/// Runs one named action of a command node.
+///
+/// Takes the task group of its run and the words after its name, a word list (see WordList.h) of
+/// its own. Returns true on success, or when the work was started and completes through the group;
+/// false on failure. It runs on the shell thread, any number of times. Work that goes on after it
+/// has returned holds a membership of the group until it has ended, in success, failure or
+/// time-out alike.
+using CommandHandler = dispatch::block<bool(dispatch::group, std::list<std::string>)>;
+
+/// One node of the command tree: a command word with its handlers and its sub-commands.
+///
+/// A concrete command derives from it, fills its tables in `registerCommands`, and offers a static
+/// `create` that takes the new node into a shared pointer, calls `init` on it and returns it. The
+/// order matters: the children that `registerCommands` makes refer to this node weakly, which
+/// needs an owner.
+///
+/// Ownership: a parent owns its children; a child refers to its parent weakly.
+/// Threads: the shell thread alone. The tables do not change after `init`; there are no locks.
+class CommandBase : public std::enable_shared_from_this<CommandBase> {
+ public:
+  CommandBase(const CommandBase&) = delete;
+  CommandBase& operator=(const CommandBase&) = delete;
+  virtual ~CommandBase() = default;
+
+  /// Completes the path of names and calls `registerCommands`. Called once, by `create`.
+  virtual void init();
+
+  /// Prints the handlers with their help, the trees of the sub-commands and the shell's own words
+  /// to standard output, each line flushed at once.
+  virtual void displayHelp();
+
+  /// Whether the shell may run the handler, or enter the sub-command, called `name`. An override
+  /// that refuses says why before it returns false.
+  virtual bool isAllowed(std::string name);
+
+  /// Registers `handler` under `name`, in place of an earlier one. An empty handler is ignored, its
+  /// help with it; an empty help text leaves an earlier text as it was.
+  void addCommandHandler(const std::string& name, CommandHandler handler,
+                         const std::string& helpText);
+
+  /// Registers `child`, which must not be empty, under `name`, in place of an earlier one.
+  void addSubCommand(const std::string& name, std::shared_ptr<CommandBase> child);
+
+  bool isValidCommand(const std::string& name) const;
+  bool isValidSubCommand(const std::string& name) const;
+
+  /// The child registered under `name`, or an empty pointer.
+  std::shared_ptr<CommandBase> getSubCommandObj(const std::string& name) const;
+
+  /// Runs the handler called `name` on this thread and returns its result, once all the work that
+  /// it put on its task group has ended; there is no time-out. Without such a handler it does
+  /// nothing and returns false.
+  bool execCommand(const std::string& name, const std::list<std::string>& words) const;
+
+  /// The path of names from the root, each after a "/"; empty before `init`.
+  std::string getHierarchy() const { return hierarchy; }
+
+  /// The node one level up; empty for the root.
+  std::weak_ptr<CommandBase> getParent() const { return parent; }
+
+ protected:
+  CommandBase(std::string commandName, std::weak_ptr<CommandBase> parentCommand)
+      : parent(std::move(parentCommand)), name(std::move(commandName)) {}
+
+  /// Adds this node's handlers and sub-commands, with `addCommandHandler` and `addSubCommand`.
+  virtual void registerCommands() = 0;
+
+ private:
+  static void printCommandTree(const std::shared_ptr<CommandBase>& node, int depth);
+
+  const std::weak_ptr<CommandBase> parent;
+  const std::string name;
+  std::string hierarchy;
+  std::map<std::string, CommandHandler> commandHandlers;
+  std::map<std::string, std::string> commandHelp;  // only for handlers that have a help text
+  std::map<std::string, std::shared_ptr<CommandBase>> subCommands;
+};

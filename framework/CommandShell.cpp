@@ -1,0 +1,111 @@
+#include "framework/CommandShell.h"
+
+#include <iostream>
+
+#include "framework/WordList.h"
+
+std::list<std::string> CommandShell::convertCmdArgsToList(int argc, const char* const* argv) {
+  std::list<std::string> words;
+  for (int i = 0; i < argc; ++i) words.emplace_front(argv[i]);
+  return words;
+}
+
+bool CommandShell::run(std::list<std::string> words) {
+  rootCommand = createRootCommand();
+  if (!rootCommand) return false;
+  currentCommand = rootCommand;
+  if (!words.empty()) words.pop_back();
+  if (!words.empty()) return runBatch(words) != Outcome::failed;
+  promptCommand = rootCommand;
+  return runLines() != Outcome::failed;
+}
+
+/// Prompts and runs lines until one of them quits, or standard input ends, which is a failure.
+CommandShell::Outcome CommandShell::runLines() {
+  for (;;) {
+    currentCommand = promptCommand;
+    std::cout << '(' << currentCommand->getHierarchy() << ")>> " << std::flush;
+    std::string line;
+    if (!std::getline(std::cin, line)) return Outcome::failed;
+    if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
+  }
+}
+
+/// Runs the groups of `words` until one does not succeed.
+CommandShell::Outcome CommandShell::runBatch(const std::list<std::string>& words) {
+  for (auto& group : splitCmdList(words)) {
+    const auto outcome = runGroup(std::move(group));
+    if (outcome == Outcome::quit) return outcome;
+    currentCommand = promptCommand ? promptCommand : rootCommand;
+    if (outcome == Outcome::failed) return outcome;
+  }
+  return Outcome::succeeded;
+}
+
+/// Resolves the words of one group in turn. Handlers come before sub-commands, and both before the
+/// shell's own words, of which only "cd" cannot be taken over.
+CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
+  const bool isOneWord = words.size() == 1;
+  for (;;) {
+    const auto word = takeNextWord(words);
+    if (word == "cd") return changeDirectory(words);
+    if (currentCommand->isValidCommand(word)) {
+      return outcomeOf(currentCommand->isAllowed(word) && currentCommand->execCommand(word, words));
+    }
+    if (!currentCommand->isValidSubCommand(word)) {
+      return runShellWord(word, words.empty(), isOneWord);
+    }
+    if (!currentCommand->isAllowed(word)) return Outcome::failed;
+    currentCommand = currentCommand->getSubCommandObj(word);
+    if (words.empty()) {  // a sub-command alone does nothing: show what it could do
+      currentCommand->displayHelp();
+      return Outcome::failed;
+    }
+  }
+}
+
+CommandShell::Outcome CommandShell::runShellWord(const std::string& word, bool isLast,
+                                                 bool isWholeGroup) {
+  if (isLast && word == "help") {
+    currentCommand->displayHelp();
+    return Outcome::succeeded;
+  }
+  if (isWholeGroup && word == "back") {
+    goBack();
+    return Outcome::succeeded;
+  }
+  if (isWholeGroup && (word == "quit" || word == "exit")) return Outcome::quit;
+  // The help that follows starts with a line end, which ends this line too.
+  std::cout << std::endl << "Invalid command option '\033[31m" << word << "\033[39m'";
+  currentCommand->displayHelp();
+  return Outcome::failed;
+}
+
+CommandShell::Outcome CommandShell::changeDirectory(const std::list<std::string>& words) {
+  if (words.size() != 1 || !followPath(words.back())) {
+    currentCommand->displayHelp();
+    return Outcome::failed;
+  }
+  if (promptCommand) promptCommand = currentCommand;
+  return Outcome::succeeded;
+}
+
+/// Moves the current node along `path`; false at the first element that leads nowhere. Moving about
+/// runs nothing, so no node is asked for permission.
+bool CommandShell::followPath(const std::string& path) {
+  for (const auto& element : splitCmdPath(path)) {
+    if (currentCommand->isValidSubCommand(element)) {
+      currentCommand = currentCommand->getSubCommandObj(element);
+    } else if (element == "..") {
+      if (const auto above = currentCommand->getParent().lock()) currentCommand = above;
+    } else {
+      return false;
+    }
+  }
+  return true;
+}
+
+void CommandShell::goBack() {
+  if (!promptCommand) return;
+  if (const auto above = promptCommand->getParent().lock()) promptCommand = above;
+}

@@ -1,0 +1,52 @@
+#pragma once
+
+#include <list>
+#include <memory>
+#include <string>
+
+#include "framework/CommandBase.h"
+
+/// Runs a command tree for a user: the words of a command line once, or lines typed at a prompt
+/// that names the node where it stands.
+///
+/// A subclass supplies the tree. Threads: one, on which every handler runs as well. It writes to
+/// standard output and reads standard input through the standard streams.
+class CommandShell {
+ public:
+  CommandShell() = default;
+  CommandShell(const CommandShell&) = delete;
+  CommandShell& operator=(const CommandShell&) = delete;
+  virtual ~CommandShell() = default;
+
+  /// All `argc` arguments as a word list (see WordList.h), the program's name at its back.
+  static std::list<std::string> convertCmdArgsToList(int argc, const char* const* argv);
+
+  /// Runs the command line `words`, the program's name at its back; called once. Without further
+  /// words it prompts and runs line after line. Returns true when every command group of the
+  /// command line succeeded, or "quit" or "exit" was typed; false when one failed, no tree could
+  /// be made, or standard input ended.
+  bool run(std::list<std::string> words);
+
+ protected:
+  /// Builds the tree and returns its root, or an empty pointer when it cannot be made. Called once,
+  /// first of all, by `run`.
+  virtual std::shared_ptr<CommandBase> createRootCommand() = 0;
+
+ private:
+  /// How a command group, or a batch of them, ended.
+  enum class Outcome { succeeded, failed, quit };
+
+  static Outcome outcomeOf(bool success) { return success ? Outcome::succeeded : Outcome::failed; }
+
+  Outcome runLines();
+  Outcome runBatch(const std::list<std::string>& words);
+  Outcome runGroup(std::list<std::string> words);
+  Outcome runShellWord(const std::string& word, bool isLast, bool isWholeGroup);
+  Outcome changeDirectory(const std::list<std::string>& words);
+  bool followPath(const std::string& path);
+  void goBack();
+
+  std::shared_ptr<CommandBase> rootCommand;
+  std::shared_ptr<CommandBase> promptCommand;   // where the prompt stands; empty in a one-shot run
+  std::shared_ptr<CommandBase> currentCommand;  // where the next word is looked up
+};

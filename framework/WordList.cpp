@@ -1,0 +1,39 @@
+#include "framework/WordList.h"
+
+#include <algorithm>
+#include <sstream>
+#include <utility>
+
+std::string takeNextWord(std::list<std::string>& words) {
+  std::string word = std::move(words.back());
+  words.pop_back();
+  return word;
+}
+
+std::list<std::string> convertLineToList(const std::string& line) {
+  std::list<std::string> words;
+  std::istringstream stream(line);
+  for (std::string word; stream >> word;) words.push_front(word);
+  return words;
+}
+
+std::vector<std::list<std::string>> splitCmdList(std::list<std::string> words) {
+  std::vector<std::list<std::string>> batch;
+  std::list<std::string> group;
+  while (!words.empty()) {
+    if (words.back() != "--") {
+      group.splice(group.begin(), words, std::prev(words.end()));
+      continue;
+    }
+    words.pop_back();
+    if (!group.empty()) batch.push_back(std::exchange(group, {}));
+  }
+  if (!group.empty()) batch.push_back(std::move(group));
+  return batch;
+}
+
+std::vector<std::string> splitCmdPath(std::string path) {
+  std::ranges::replace(path, '/', ' ');
+  const auto words = convertLineToList(path);
+  return {words.rbegin(), words.rend()};
+}
