@@ -1,0 +1,64 @@
+#include "platform/host/Device.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <iterator>
+#include <mutex>
+
+namespace host {
+namespace {
+
+constexpr int kBadProfile = 255;
+constexpr std::size_t kLargestProfile = 1 << 20;
+
+[[noreturn]] void refuse(const std::string& why) {
+  std::fprintf(stderr, "%s\n", why.c_str());
+  std::exit(kBadProfile);
+}
+
+std::string readProfileText(const std::string& file) {
+  errno = 0;
+  std::ifstream stream(file, std::ios::binary);
+  std::string text(kLargestProfile + 1, '\0');
+  stream.read(text.data(), static_cast<std::streamsize>(text.size()));
+  if (!stream.eof()) {
+    refuse(file + ":0: " + (stream.fail() ? strerror(errno) : "larger than a profile may be"));
+  }
+  text.resize(static_cast<std::size_t>(stream.gcount()));
+  return text;
+}
+
+Profile* loadProfile() {
+  auto* const profile = new Profile;
+  const char* const file = std::getenv("ZUB_DEVICE");
+  if (!file || !*file) return profile;
+  if (const auto wrong = parseProfile(readProfileText(file), file, *profile)) refuse(*wrong);
+  return profile;
+}
+
+}  // namespace
+
+Profile& device() {
+  static auto* const profile = loadProfile();  // never destroyed: other threads outlive exit
+  return *profile;
+}
+
+void recordRequest(const std::string& line) {
+  const auto& path = device().requestLog;
+  if (path.empty()) return;
+  const int log = open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
+  const std::string whole = line + '\n';
+  // One write each, so that lines of several processes never mix.
+  if (log < 0 || write(log, whole.data(), whole.size()) != static_cast<ssize_t>(whole.size())) {
+    std::fprintf(stderr, "%s: cannot write the request log: %s\n", path.c_str(), strerror(errno));
+  }
+  if (log >= 0) close(log);
+}
+
+}  // namespace host

@@ -1,0 +1,18 @@
+#pragma once
+
+#include <string>
+
+#include "platform/host/Profile.h"
+
+/// The device that this library stands in for. There is one in a process.
+namespace host {
+
+/// The device's profile. The first call reads the file that the environment variable ZUB_DEVICE
+/// names, if it is set; when that is not possible it says why on standard error and ends the
+/// process with status 255. Threads: any. A test may change the profile while nothing else runs.
+Profile& device();
+
+/// Appends `line` to the device's request log, if it keeps one. Threads: any.
+void recordRequest(const std::string& line);
+
+}  // namespace host

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <string_view>
+
+namespace host {
+
+/// The part of `path` after its last slash: all of it where there is none, nothing where the slash
+/// ends it.
+std::string_view fileName(std::string_view path);
+
+/// The name of a process: `comm`, its name as the kernel keeps it, or the whole of what the kernel
+/// has cut. The kernel keeps 15 bytes; where `comm` is that long and the file name of the
+/// executable `exePath` starts with it, that file name is the name. The " (deleted)" that the
+/// kernel adds to the path of an executable which is gone is not part of it.
+///
+/// Either may be empty. The result lies in one of the two.
+std::string_view processName(std::string_view comm, std::string_view exePath);
+
+/// What the kernel keeps of the name of a process.
+std::string_view keptByKernel(std::string_view name);
+
+}  // namespace host

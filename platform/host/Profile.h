@@ -1,0 +1,67 @@
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/telephony.h"
+
+namespace host {
+
+/// How the device answers one kind of request: with a value, or with a fault.
+struct Answer {
+  enum class Kind { value, error, nullReply, emptyReply };
+  Kind kind = Kind::value;
+  std::string text = {};  ///< of a value, where the request has one
+  std::int32_t code = 0;  ///< of an error
+};
+
+/// The server reports `state` at `at` after the manager is made.
+struct ServerStep {
+  std::chrono::milliseconds at;
+  std::string state;
+};
+
+enum class Build { internal, carrier, customer };
+
+/// One device, as a profile describes it. The defaults are a phone on which everything works.
+struct Profile {
+  int radio = 1;
+  int product = static_cast<int>(TelephonyProduct::Phone);
+  int radioVendor = 1;
+  bool qdss = true;
+  Build build = Build::internal;
+  std::int32_t compression = 1;
+  bool compressionSupported = true;
+  std::vector<std::string> processes = {"Orvalind", "modemd"};
+  bool hostProcesses = false;  ///< the processes of this machine run on the device as well
+
+  std::vector<ServerStep> server = {{std::chrono::milliseconds(0), "Started"}};
+  Answer systemLogsMode = {.text = "full"};
+  Answer basebandEnabled = {.text = "true"};
+  Answer basebandHighThroughput = {.text = "false"};
+  Answer dump;
+  std::optional<std::string> dumpTimestamp;  ///< none: the time of the request
+  std::chrono::milliseconds dumpDelay{0};
+
+  bool helperExists = true;
+  Answer helper;
+  std::optional<std::string> helperTimestamp;
+
+  std::string requestLog;  ///< path; empty for none
+
+  std::string log = "sample";               ///< "sample", "journal", or a path
+  std::string logPrepareError;              ///< empty when the store can be prepared
+  std::optional<unsigned long> logEnd = 5;  ///< the reason a stream ends with; none: it never ends
+};
+
+/// Reads the text of a profile into `profile`, which keeps its defaults for keys that are not set.
+/// `file` is the profile's path, for messages and for the paths it takes from its own folder.
+/// Returns what is wrong as "FILE:LINE: what", or nothing when the profile is good.
+std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
+                                        Profile& profile);
+
+}  // namespace host

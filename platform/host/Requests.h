@@ -1,0 +1,25 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "platform/host/Profile.h"
+#include "platform/lumo.h"
+#include "platform/zub_client.h"
+
+/// What the simulated server and the simulated helper service have in common.
+namespace host {
+
+/// A request's dictionary as the request log shows it: "{Key="text", Other=1}".
+std::string describe(const lumo::dict& request);
+
+/// Answers a request as the profile says: `answer`'s fault if it is one, else success with
+/// {`key`=`value`} in `*reply`.
+TelephonyLumo::Result answerWith(const Answer& answer, std::string_view key, std::string value,
+                                 lumo::object* reply);
+
+/// The timestamp that the profile gives, or else the current local time to the millisecond, as
+/// "YYYY-MM-DD-HH-MM-SS-mmm".
+std::string timestampOr(const std::optional<std::string>& given);
+
+}  // namespace host

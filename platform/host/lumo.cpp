@@ -1,0 +1,46 @@
+#include "platform/lumo.h"
+
+#include <algorithm>
+
+namespace lumo {
+namespace {
+
+const object& nullObject() {
+  static const auto* const null = new object;  // never destroyed: other threads outlive exit
+  return *null;
+}
+
+}  // namespace
+
+dict::dict() = default;
+dict::dict(const dict&) = default;
+dict::dict(dict&&) noexcept = default;
+dict& dict::operator=(const dict&) = default;
+dict& dict::operator=(dict&&) noexcept = default;
+dict::~dict() = default;
+
+void dict::set(std::string_view key, object value) {
+  const auto found = std::ranges::find(items, key, &entry::key);
+  if (found != items.end()) {
+    found->value = std::move(value);
+  } else {
+    items.push_back({std::string(key), std::move(value)});
+  }
+}
+
+const object& dict::get(std::string_view key) const {
+  const auto found = std::ranges::find(items, key, &entry::key);
+  return found != items.end() ? found->value : nullObject();
+}
+
+const object& object::get(std::string_view key) const {
+  const auto* const entries = as<dict>();
+  return entries ? entries->get(key) : nullObject();
+}
+
+std::string dyn_cast_or_default(const object& value, std::string_view otherwise) {
+  const auto* const text = value.as<std::string>();
+  return text ? *text : std::string(otherwise);
+}
+
+}  // namespace lumo
