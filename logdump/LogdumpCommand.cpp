@@ -1,0 +1,49 @@
+#include "logdump/LogdumpCommand.h"
+
+#include <iostream>
+
+#include "logdump/BasebandLogs.h"
+#include "logdump/OsLogCommand.h"
+#include "logdump/TelephonyLogs.h"
+#include "logdump/TraceProperty.h"
+#include "tool/ServerState.h"
+
+std::shared_ptr<CommandBase> LogdumpCommand::create(
+    const std::string& commandName, std::weak_ptr<CommandBase> parentCommand,
+    std::shared_ptr<zub::client::Manager> serverManager, dispatch::queue toolQueue) {
+  std::shared_ptr<CommandBase> node(new LogdumpCommand(
+      commandName, std::move(parentCommand), std::move(serverManager), std::move(toolQueue)));
+  node->init();
+  return node;
+}
+
+bool LogdumpCommand::isAllowed(std::string handler) {
+  if (handler == "bb") return true;  // the helper service stands in for the server
+  if (IsServerRunning()) return true;
+  std::cerr << kServerDownErrorPrint << std::endl;
+  return false;
+}
+
+void LogdumpCommand::registerCommands() {
+  addCommandHandler("tel", telephonyLogsHandler(*this),
+                    "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs");
+  addCommandHandler(
+      "core", telephonyLogsWithCoredumpHandler(*this),
+      "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs with coredump");
+  addCommandHandler("bb", basebandLogsHandler(*this),
+                    "[nocompress|tar.gz|tar] <reason> collect baseband logs only");
+  addCommandHandler("oslog", osLogHandler(),
+                    "[history size] [output txt file path] -p <process1 process2..> -i "
+                    "<imagePath1 imagePath2..> collect oslog to txt");
+}
+
+bool LogdumpCommand::isSystemLogsTraceLite() const {
+  constexpr std::int32_t kLite = 2;
+  lumo::dict request;
+  request.set(zub::kKeyTraceName, zub::kTraceSystemLogs);
+  request.set(zub::kKeyTracePropertyName, zub::kKeyTraceMode);
+  lumo::object reply;
+  zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty, request, &reply);
+  return parseTraceMode(lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), "")) ==
+         kLite;
+}

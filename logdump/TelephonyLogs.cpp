@@ -1,0 +1,88 @@
+#include "logdump/TelephonyLogs.h"
+
+#include <iostream>
+
+#include "logdump/LogdumpCommand.h"
+#include "logdump/LogdumpOptions.h"
+#include "logdump/TraceNames.h"
+#include "platform/telephony.h"
+
+namespace {
+
+/// What tells the two collections apart. There is one constant object for each.
+struct Collection {
+  const char* label;
+  lumo::dict (*makeRequest)(const std::string& reason, CompressionMode mode);
+  bool followsLiteTrace;  ///< a lite system-logs trace leaves nothing to compress
+  std::string (*defaultSuffix)();
+};
+
+lumo::dict telephonyRequest(const std::string& reason, CompressionMode mode) {
+  lumo::dict request;
+  request.set(zub::kKeyTraceAction, zub::kCollectTelephonyLogs);
+  request.set(zub::kKeyTraceDumpStateReason, reason);
+  request.set(zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode));
+  return request;
+}
+
+lumo::dict coredumpRequest(const std::string& reason, CompressionMode mode) {
+  lumo::dict request;
+  request.set(zub::kKeyBasebandResetType, zub::kBasebandResetTypeHard);
+  request.set(zub::kKeyBasebandResetSubType, zub::kBasebandResetSubTypeOtherErrors);
+  request.set(zub::kKeyTraceAction, zub::kCollectTelephonyLogsWithCoredump);
+  request.set(zub::kKeyBasebandResetReason, reason);
+  request.set(zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode));
+  return request;
+}
+
+constexpr Collection kTelephony = {"Telephony log collection: ", telephonyRequest, true,
+                                   [] { return std::string("-*"); }};
+constexpr Collection kTelephonyWithCoredump = {
+    "Telephony log collection with Coredump: ", coredumpRequest, false,
+    zub::trace::getCoreDumpDirSuffix};
+
+void printOutcome(const Collection& collection, CompressionMode mode,
+                  const TelephonyLumo::Result& result, const lumo::object& reply) {
+  const bool succeeded = result.code == 0;
+  std::cout << collection.label << (succeeded ? "Success" : "Failed") << std::endl;
+  if (!succeeded || !reply.isDict()) return;
+  const auto timestamp = lumo::dyn_cast_or_default(reply.get(zub::kKeyTimestampString), "");
+  std::cout << "Path = " << buildLogPath(timestamp, mode, collection.defaultSuffix()) << std::endl;
+}
+
+bool collect(const LogdumpCommand& node, const Collection& collection, const dispatch::group& group,
+             const std::list<std::string>& words) {
+  auto mode = static_cast<CompressionMode>(defaults::compression::mode());
+  std::string reason;
+  bool noUi = false;
+  parseLogdumpOptions(words, mode, reason, noUi);
+  if (collection.followsLiteTrace && node.isSystemLogsTraceLite()) mode = CompressionMode::none;
+  auto request = collection.makeRequest(reason, mode);
+  if (noUi) request.set(zub::kKeyTraceUserConfirmation, false);
+
+  const dispatch::membership sending(group);
+  zub::client::PerformCommand(
+      node.manager, zub::kCommandTraceDumpState,
+      [&collection, mode, collecting = sending](const TelephonyLumo::Result& result,
+                                                const lumo::object& reply) {
+        printOutcome(collection, mode, result, reply);
+      },
+      request);
+  return true;
+}
+
+CommandHandler handlerOf(const LogdumpCommand& node, const Collection& collection) {
+  return [&node, &collection](const dispatch::group& group, const std::list<std::string>& words) {
+    return collect(node, collection, group, words);
+  };
+}
+
+}  // namespace
+
+CommandHandler telephonyLogsHandler(const LogdumpCommand& node) {
+  return handlerOf(node, kTelephony);
+}
+
+CommandHandler telephonyLogsWithCoredumpHandler(const LogdumpCommand& node) {
+  return handlerOf(node, kTelephonyWithCoredump);
+}

@@ -1,0 +1,18 @@
+#include "tool/ServerState.h"
+
+#include <atomic>
+
+#include "platform/zub_client.h"
+
+namespace {
+
+std::atomic<bool> gServerRunning = false;
+
+}  // namespace
+
+bool IsServerRunning() { return gServerRunning.load(std::memory_order_relaxed); }
+
+void NoteServerState(const lumo::object& payload) {
+  const auto state = lumo::dyn_cast_or_default(payload.get(zub::kKeyServerState), "");
+  gServerRunning.store(state == zub::kServerStateStarted, std::memory_order_relaxed);
+}

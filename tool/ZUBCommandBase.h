@@ -1,0 +1,19 @@
+#pragma once
+
+#include "framework/CommandBase.h"
+#include "platform/zub_client.h"
+
+/// A command node of the tool: it can talk to the server, and so can the children that it makes.
+///
+/// The manager and the queue are shared by all nodes and live at least as long as any of them.
+class ZUBCommandBase : public CommandBase {
+ protected:
+  ZUBCommandBase(const std::string& commandName, std::weak_ptr<CommandBase> parentCommand,
+                 std::shared_ptr<zub::client::Manager> serverManager, dispatch::queue toolQueue);
+
+ public:
+  ~ZUBCommandBase() override;
+
+  const std::shared_ptr<zub::client::Manager> manager;
+  const dispatch::queue queue;  ///< on which the manager's callbacks run
+};

@@ -1,0 +1,39 @@
+#include "tool/ZUBShell.h"
+
+#include "platform/system.h"
+#include "platform/zub_client.h"
+#include "tool/ServerState.h"
+#include "tool/ZUBCommand.h"
+
+namespace {
+
+constexpr auto kFirstStateWait = std::chrono::milliseconds(500);
+
+/// Has the server's state followed from now on. Each live reference to the event handler, the
+/// library's own included, is a member of `group`.
+void followServerState(const std::shared_ptr<zub::client::Manager>& manager,
+                       const dispatch::group& group) {
+  const zub::client::EventHandler handler =
+      [manager, member = dispatch::membership(group)](
+          const lumo::object& payload, const dispatch::group&) { NoteServerState(payload); };
+  zub::client::RegisterEventHandler(manager, zub::kEventServerStateChange, handler);
+  // Off and on again: a server that has reported its state before then reports it anew.
+  zub::client::EventsOff(manager);
+  zub::client::EventsOn(manager);
+}
+
+}  // namespace
+
+std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
+  const dispatch::queue queue("zubtool.queue");
+  const auto manager = zub::client::CreateManager("zubtool", queue);
+  const auto group = dispatch::group::create();
+  {
+    const dispatch::membership own(group);
+    followServerState(manager, group);
+  }
+  // A library that keeps the handler keeps the group open, and the wait lasts its full time. Either
+  // way the tool starts: commands that need the server ask for its state themselves.
+  static_cast<void>(group.wait(kFirstStateWait));
+  return ZUBCommand::create(getprogname(), {}, manager, queue);
+}
