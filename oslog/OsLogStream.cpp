@@ -1,0 +1,178 @@
+#include "oslog/OsLogStream.h"
+
+#include <atomic>
+#include <charconv>
+#include <mutex>
+
+#include "platform/oslog_store.h"
+#include "platform/system.h"
+
+namespace {
+
+constexpr std::chrono::seconds kTimeout{180};
+constexpr std::uint64_t kStreamFlags = 21;       // the bits are the log store's
+constexpr std::uint32_t kLogMessageType = 1024;  // likewise
+
+using StreamHandle = std::shared_ptr<OSLogEventStream>;
+
+/// The file of one export. Lines come from the store's thread, and may still come when the export
+/// is over: a closed file takes none.
+class LineFile {
+ public:
+  explicit LineFile(platform::FileHandle opened) : file(std::move(opened)) {}
+
+  /// Writes `line`, unless the file is closed. False when it could not be written whole; that
+  /// closes the file.
+  bool append(const std::string& line) {
+    const std::lock_guard lock(mutex);
+    if (!closing && file && !file.write(line)) {
+      failed = true;
+      closing = true;
+      file.close();
+      return false;
+    }
+    if (closing) file.close();
+    return true;
+  }
+
+  /// Does not wait for a line that is being written, for a stalled reader may hold it up for good:
+  /// the file then closes behind that line.
+  void close() {
+    closing = true;
+    if (const std::unique_lock lock(mutex, std::try_to_lock); lock) file.close();
+  }
+
+  bool hasFailed() const { return failed; }
+
+ private:
+  std::mutex mutex;
+  platform::FileHandle file;
+  std::atomic<bool> closing = false;
+  std::atomic<bool> failed = false;
+};
+
+/// Prepares the local store. Empty, and the reason in the system log, when that fails.
+StreamHandle prepareStream() {
+  struct Outcome {
+    std::mutex mutex;
+    StreamHandle stream;
+  };
+  // Shared with the handler, since a store that calls it too late finds nobody waiting.
+  const auto outcome = std::make_shared<Outcome>();
+  OSLogEventStore::localStore()->prepareWithCompletionHandler(
+      [outcome](const std::shared_ptr<OSLogEventSource>& source,
+                const std::optional<std::string>& error) {
+        if (error) return platform::logError("Could not open: " + *error);
+        const std::lock_guard lock(outcome->mutex);
+        outcome->stream = OSLogEventStream::initWithSource(source);
+      });
+  const std::lock_guard lock(outcome->mutex);
+  if (!outcome->stream) platform::logError("Failed to prepare oslog stream");
+  return std::move(outcome->stream);
+}
+
+void setFilter(OSLogEventStream& stream, const std::list<std::string>& processes,
+               const std::list<std::string>& imagePaths) {
+  OSLogOrPredicate filter;
+  for (const auto& process : processes) filter.terms.push_back({"process == %@", process});
+  for (const auto& path : imagePaths) {
+    filter.terms.push_back({"senderImagePath CONTAINS[cd] %@", path});
+  }
+  if (!filter.terms.empty()) stream.setFilterPredicate(std::move(filter));
+}
+
+/// Appends `number` to `text`, in at least `leastDigits` digits.
+template <class Number>
+void appendNumber(std::string& text, Number number, int base = 10, std::size_t leastDigits = 1) {
+  char digits[20];  // of any 64-bit number
+  const char* const end = std::to_chars(digits, std::end(digits), number, base).ptr;
+  const auto length = static_cast<std::size_t>(end - digits);
+  if (length < leastDigits) text.append(leastDigits - length, '0');
+  text.append(digits, length);
+}
+
+/// "DATE 0xTHREAD 0xACTIVITY PID PROCESS(SENDER):SUBSYSTEM [CATEGORY] MESSAGE\n", the date being
+/// the wall-clock time of the device that logged.
+std::string formatLine(const OSLogEventProxy& event) {
+  constexpr std::size_t kMostForDateAndNumbers = 100;
+  const std::string_view texts[] = {
+      event.process(),  "(",  event.sender(),          "):", event.subsystem(), " [",
+      event.category(), "] ", event.composedMessage(), "\n"};
+  std::size_t size = kMostForDateAndNumbers;
+  for (const auto text : texts) size += text.size();
+  std::string line;
+  line.reserve(size);
+  const auto date = event.date();
+  date.addingSeconds(event.timeZone().secondsFromGMT(date)).appendDescription(line);
+  line.append(" 0x");
+  appendNumber(line, event.threadIdentifier(), 16, 5);
+  line.append(" 0x");
+  appendNumber(line, event.activityIdentifier(), 16);
+  line.push_back(' ');
+  appendNumber(line, event.processIdentifier());
+  line.push_back(' ');
+  for (const auto text : texts) line.append(text);
+  return line;
+}
+
+void setHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& file,
+                 const std::string& path, const dispatch::group& group) {
+  const std::weak_ptr<OSLogEventStream> weakStream = stream;  // the stream owns its handlers
+  stream->setEventHandler([file, path, weakStream](const OSLogEventProxy& event) {
+    if (event.type() != kLogMessageType || file->append(formatLine(event))) return;
+    platform::logError("Failed to write file: " + path);
+    if (const auto failing = weakStream.lock()) failing->invalidate();
+  });
+  stream->setInvalidationHandler([group](unsigned long reason, const OSLogEventStreamPosition&) {
+    if (reason != kOSLogEventStreamEndOfLog) {
+      platform::logError("Invalid oslog stream: reason = " + std::to_string(reason));
+    }
+    group.leave();
+  });
+}
+
+/// Streams the last `history` seconds. True when the stream ended within `timeout`.
+bool runStream(OSLogEventStream& stream, const dispatch::group& group, double history,
+               std::chrono::nanoseconds timeout) {
+  const auto start = OSLogDate::now().addingSeconds(-history);
+  group.enter();
+  platform::logError("Getting oslog stream: history = " + std::to_string(history));
+  stream.activateStreamFromDate(start);
+  if (group.wait(timeout)) return true;
+  stream.invalidate();
+  platform::logError("Timeout on getting oslog stream");
+  return false;
+}
+
+}  // namespace
+
+bool OsLogStream::putOsLogStreamToFile(const std::string& path,
+                                       const std::list<std::string>& process,
+                                       const std::list<std::string>& imagePath, double history) {
+  return putWithin(kTimeout, path, process, imagePath, history);
+}
+
+bool OsLogStream::putWithin(std::chrono::nanoseconds timeout, const std::string& path,
+                            const std::list<std::string>& process,
+                            const std::list<std::string>& imagePath, double history) {
+  const auto stream = prepareStream();
+  if (!stream) return false;
+  platform::createEmptyFile(path);
+  auto opened = platform::FileHandle::openForAppending(path);
+  if (!opened) {
+    platform::logError("Failed to create file: " + path);
+    return false;
+  }
+  const auto group = dispatch::group::create();
+  if (!group) {
+    platform::logError("Failed to get group");
+    return false;
+  }
+  const auto file = std::make_shared<LineFile>(std::move(opened));
+  stream->setFlags(kStreamFlags);
+  setFilter(*stream, process, imagePath);
+  setHandlers(stream, file, path, group);
+  const bool ended = runStream(*stream, group, history, timeout);
+  file->close();
+  return ended && !file->hasFailed();
+}

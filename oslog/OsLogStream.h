@@ -1,0 +1,34 @@
+#pragma once
+
+#include <chrono>
+#include <list>
+#include <string>
+
+/// Copies the recent history of the system log into a text file, one line for each log message:
+/// date in local time, thread, activity, process identifier, process(sender):subsystem [category]
+/// message.
+///
+/// Has no instances. Its diagnostics go to the system log, never to the terminal.
+class OsLogStream {
+ public:
+  OsLogStream() = delete;
+
+  /// Empties the file at `path` and appends a line for each message of the last `history` seconds
+  /// that a process named in `process` logged, or an image whose path contains one of `imagePath`,
+  /// whatever case and accents; every message when both lists are empty. Blocks until the log has
+  /// been copied, or 180 seconds have passed.
+  ///
+  /// True when the log store ended the stream in time; it may have ended it early, which it says in
+  /// the system log. False, and the reason in the system log, when the log or the file cannot be
+  /// opened, a line cannot be written whole, or the time is up; lines written until then stay.
+  /// Threads: any; a call keeps nothing for the next.
+  static bool putOsLogStreamToFile(const std::string& path, const std::list<std::string>& process,
+                                   const std::list<std::string>& imagePath, double history);
+
+ private:
+  friend struct OsLogStreamClock;  // lets a test wait for less than 180 seconds
+
+  static bool putWithin(std::chrono::nanoseconds timeout, const std::string& path,
+                        const std::list<std::string>& process,
+                        const std::list<std::string>& imagePath, double history);
+};
