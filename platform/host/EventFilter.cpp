@@ -1,0 +1,33 @@
+#include "platform/host/EventFilter.h"
+
+#include <algorithm>
+#include <stdexcept>
+
+namespace host {
+
+EventFilter::EventFilter(OSLogOrPredicate predicate) : everything(false) {
+  for (OSLogPredicate& term : predicate.terms) {
+    if (term.format == "process == %@") {
+      names.push_back(std::move(term.value));
+    } else if (term.format == "senderImagePath CONTAINS[cd] %@") {
+      pathParts.emplace_back(term.value);
+    } else {
+      throw std::invalid_argument("not a predicate of the log store: " + term.format);
+    }
+  }
+}
+
+bool EventFilter::passes(const LogEvent& event) const {
+  if (everything) return true;
+  if (!names.empty() && std::ranges::find(names, event.process()) != names.end()) return true;
+  if (pathParts.empty()) return false;
+  const std::string_view path = event.senderImagePath();
+  return std::ranges::any_of(pathParts, [path](const FoldedText& part) { return part.isIn(path); });
+}
+
+std::optional<std::vector<std::string>> EventFilter::processes() const {
+  if (everything || !pathParts.empty()) return std::nullopt;
+  return names;
+}
+
+}  // namespace host

@@ -1,0 +1,35 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "platform/host/FoldedText.h"
+#include "platform/host/LogEvent.h"
+#include "platform/oslog_store.h"
+
+namespace host {
+
+/// Decides which events a stream delivers. Threads: any, after it has been made.
+class EventFilter {
+ public:
+  /// Lets every event pass.
+  EventFilter() = default;
+
+  /// Lets an event pass for which `predicate` is true: none if it has no terms. Throws
+  /// `std::invalid_argument` for a format that `OSLogPredicate` does not list.
+  explicit EventFilter(OSLogOrPredicate predicate);
+
+  bool passes(const LogEvent& event) const;
+
+  /// The names of which a process must have one for its events to pass; nothing when other events
+  /// may pass as well.
+  std::optional<std::vector<std::string>> processes() const;
+
+ private:
+  bool everything = true;
+  std::vector<std::string> names;
+  std::vector<FoldedText> pathParts;
+};
+
+}  // namespace host

@@ -1,0 +1,100 @@
+#include "platform/host/FoldedText.h"
+
+#include <algorithm>
+#include <array>
+
+#include "platform/host/Utf8.h"
+
+namespace host {
+namespace {
+
+/// What each letter from U+00C0, and from U+1E00, on folds to.
+constexpr std::u16string_view kLatin1ToExtendedB =
+    u"aaaaaaæceeeeiiiiðnooooo×ouuuuyþßaaaaaaæceeeeiiiiðnooooo÷ouuuuyþyaaaaaaccccccccdd"
+    u"ddeeeeeeeeeegggggggghhhhiiiiiiiiiıĳĳjjkkĸllllllllllnnnnnnŉŋŋooooooœœrrrrrrssssss"
+    u"ssttttttuuuuuuuuuuuuwwyyyzzzzzzsbbbbƅƅɔccddddƍǝəɛffgɣƕɩikklƛɯnnoooƣƣppʀƨƨʃƪttttu"
+    u"uʊvyyzzʒƹƹƺƻƽƽƾƿǀǁǂǃǆǆǆǉǉǉǌǌǌaaiioouuuuuuuuuuǝaaaaææggggkkooooʒʒjǳǳǳggƕƿnnaaææoo"
+    u"aaaaeeeeiiiioooorrrruuuussttȝȝhhndȣȣzzaaeeooooooooyylntȷȸȹaccltszɂɂbʉʌeejjqqrryy";
+constexpr std::u16string_view kExtendedAdditional =
+    u"aabbbbbbccddddddddddeeeeeeeeeeffgghhhhhhhhhhiiiikkkkkkllllllllmmmmmmnnnnnnnnoooo"
+    u"oooopppprrrrrrrrssssssssssttttttttuuuuuuuuuuvvvvwwwwwwwwwwxxxxyyzzzzzzhtwyasẜẝßẟ"
+    u"aaaaaaaaaaaaaaaaaaaaaaaaeeeeeeeeeeeeeeeeiiiioooooooooooooooooooooooouuuuuuuuuuuu"
+    u"uuyyyyyyyyỻỻỽỽyy";
+
+/// Letters outside those two ranges that are the other case of one inside.
+struct Outsider {
+  char16_t letter;
+  char16_t base;
+};
+constexpr auto kOutsiders = std::to_array<Outsider>({
+    {u'ɓ', u'b'},
+    {u'ɖ', u'd'},
+    {u'ɗ', u'd'},
+    {u'ɠ', u'g'},
+    {u'ɨ', u'i'},
+    {u'ɲ', u'n'},
+    {u'ɵ', u'o'},
+    {u'ʈ', u't'},
+    {u'ʋ', u'v'},
+    {u'ⱥ', u'a'},
+    {u'ⱦ', u't'},
+    {u'Ȿ', u's'},
+    {u'Ɀ', u'z'},
+});
+
+constexpr char32_t kFirstMark = 0x300;
+constexpr char32_t kLastMark = 0x36F;
+
+constexpr bool isAscii(char32_t code) { return code < 0x80; }
+
+constexpr char smallAscii(char letter) {
+  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter + ('a' - 'A')) : letter;
+}
+
+/// True when `letters`, which begin with those of `first`, have one for `code`.
+constexpr bool covers(std::u16string_view letters, char32_t first, char32_t code) {
+  return code >= first && code - first < letters.size();
+}
+
+constexpr char32_t kLatin1First = 0xC0;
+constexpr char32_t kAdditionalFirst = 0x1E00;
+static_assert(covers(kLatin1ToExtendedB, kLatin1First, 0x24F));
+static_assert(!covers(kLatin1ToExtendedB, kLatin1First, 0x250));
+static_assert(covers(kExtendedAdditional, kAdditionalFirst, 0x1EFF));
+static_assert(!covers(kExtendedAdditional, kAdditionalFirst, 0x1F00));
+
+char32_t baseLetter(char32_t code) {
+  if (isAscii(code)) return static_cast<unsigned char>(smallAscii(static_cast<char>(code)));
+  if (covers(kLatin1ToExtendedB, kLatin1First, code)) {
+    return kLatin1ToExtendedB[code - kLatin1First];
+  }
+  if (covers(kExtendedAdditional, kAdditionalFirst, code)) {
+    return kExtendedAdditional[code - kAdditionalFirst];
+  }
+  const auto* const outsider = std::ranges::find(kOutsiders, code, &Outsider::letter);
+  return outsider == kOutsiders.end() ? code : outsider->base;
+}
+
+std::string fold(std::string_view text) {
+  std::string folded;
+  while (!text.empty()) {
+    const char32_t code = takeCodePoint(text);
+    if (code < kFirstMark || code > kLastMark) appendUtf8(folded, baseLetter(code));
+  }
+  return folded;
+}
+
+}  // namespace
+
+FoldedText::FoldedText(std::string_view text) : folded(fold(text)) {}
+
+bool FoldedText::isIn(std::string_view text) const {
+  const auto ascii = [](char byte) { return isAscii(static_cast<unsigned char>(byte)); };
+  if (!std::ranges::all_of(text, ascii)) return fold(text).find(folded) != std::string::npos;
+  // Nearly every path: compared in place.
+  const auto same = [](char theirs, char ours) { return smallAscii(theirs) == ours; };
+  return folded.empty() ||
+         std::search(text.begin(), text.end(), folded.begin(), folded.end(), same) != text.end();
+}
+
+}  // namespace host

@@ -1,0 +1,16 @@
+#pragma once
+
+/// The reasons, besides kOSLogEventStreamEndOfLog, with which the streams of this store end.
+namespace host {
+
+/// The stream was asked to stop.
+inline constexpr unsigned long kStreamInvalidated = 1;
+
+/// The log is damaged or cut off. All that stood whole before that has been delivered.
+inline constexpr unsigned long kStreamDamaged = 2;
+
+/// The log, or the rest of it, could not be read: an error of the file, or journalctl failed or
+/// complained.
+inline constexpr unsigned long kStreamUnreadable = 3;
+
+}  // namespace host

@@ -1,0 +1,151 @@
+#include "platform/oslog_store.h"
+
+#include <stdexcept>
+#include <system_error>
+#include <thread>
+#include <utility>
+
+#include "platform/host/Device.h"
+#include "platform/host/EntryReader.h"
+#include "platform/host/EventFilter.h"
+#include "platform/host/LogEvent.h"
+#include "platform/host/LogSource.h"
+#include "platform/host/ReadAhead.h"
+#include "platform/host/StopSignal.h"
+#include "platform/host/StreamEnd.h"
+
+namespace {
+
+using host::EntryReader;
+
+/// All that a stream's thread works with.
+struct Delivery {
+  std::shared_ptr<host::LogSource> source;
+  std::shared_ptr<host::StopSignal> stop;
+  host::EventFilter filter;
+  OSLogEventStream::EventHandler eventHandler;
+  OSLogEventStream::InvalidationHandler invalidationHandler;
+  OSLogDate from{0};
+  std::optional<unsigned long> reasonOfNormalEnd;
+};
+
+/// The bytes to read, or none when they cannot be had.
+std::unique_ptr<host::ByteSource> openSource(const Delivery& delivery) {
+  try {
+    return delivery.source->open(delivery.from, delivery.filter, *delivery.stop);
+  } catch (const std::system_error&) {
+    return nullptr;
+  }
+}
+
+/// Delivers what is wanted until the log ends or the stream is stopped, and returns the reason.
+unsigned long deliverEvents(const Delivery& delivery) {
+  const auto bytes = openSource(delivery);
+  if (bytes == nullptr) return host::kStreamUnreadable;
+  host::ReadAhead reader(*bytes, [&delivery](const host::LogEntry& entry) {
+    const host::LogEvent event(entry);
+    return event.date() >= delivery.from && delivery.filter.passes(event);
+  });
+  const host::LogEvent event(reader.entry());
+  EntryReader::Result result = EntryReader::Result::stopped;
+  while (!delivery.stop->raised()) {
+    result = reader.next();
+    if (result != EntryReader::Result::entry) break;
+    if (delivery.eventHandler) delivery.eventHandler(event);
+  }
+  if (delivery.stop->raised()) return host::kStreamInvalidated;
+  if (result == EntryReader::Result::damaged) return host::kStreamDamaged;
+  if (result != EntryReader::Result::end) return host::kStreamUnreadable;
+  if (delivery.reasonOfNormalEnd) return *delivery.reasonOfNormalEnd;
+  while (delivery.stop->waitReadable(-1)) {
+  }
+  return host::kStreamInvalidated;
+}
+
+/// Ends a stream. Nothing of it is left when the invalidation handler runs.
+void end(Delivery delivery, unsigned long reason) {
+  const auto handler = std::move(delivery.invalidationHandler);
+  delivery = Delivery();
+  if (handler) handler(reason, OSLogEventStreamPosition());
+}
+
+/// The life of a stream's thread.
+void run(Delivery delivery) {
+  const unsigned long reason = deliverEvents(delivery);
+  end(std::move(delivery), reason);
+}
+
+class HostStream final : public OSLogEventStream {
+ public:
+  explicit HostStream(std::shared_ptr<host::LogSource> source)
+      : stop(std::make_shared<host::StopSignal>()) {
+    delivery.source = std::move(source);
+    delivery.stop = stop;
+    delivery.reasonOfNormalEnd = host::device().logEnd;
+  }
+
+  void setFlags(std::uint64_t) override {}  // nothing that this store does can be switched
+
+  void setFilterPredicate(OSLogOrPredicate predicate) override {
+    delivery.filter = host::EventFilter(std::move(predicate));
+  }
+
+  void setEventHandler(EventHandler handler) override {
+    delivery.eventHandler = std::move(handler);
+  }
+
+  void setInvalidationHandler(InvalidationHandler handler) override {
+    delivery.invalidationHandler = std::move(handler);
+  }
+
+  void activateStreamFromDate(OSLogDate date) override {
+    if (delivery.source == nullptr) return;  // activated before
+    delivery.from = date;
+    // Shared, so that it is still there when no thread can be had.
+    const auto handed = std::make_shared<Delivery>(std::exchange(delivery, Delivery()));
+    try {
+      std::thread([handed] { run(std::move(*handed)); }).detach();
+    } catch (const std::system_error&) {
+      end(std::move(*handed), host::kStreamUnreadable);
+    }
+  }
+
+  void invalidate() override { stop->raise(); }
+
+ private:
+  const std::shared_ptr<host::StopSignal> stop;
+  Delivery delivery;
+};
+
+class HostStore final : public OSLogEventStore {
+ public:
+  void prepareWithCompletionHandler(PrepareHandler handler) override {
+    std::shared_ptr<OSLogEventSource> source;
+    std::optional<std::string> error;
+    try {
+      const host::Profile& device = host::device();
+      if (!device.logPrepareError.empty()) throw std::runtime_error(device.logPrepareError);
+      source = host::prepareLog(device.log);
+    } catch (const std::runtime_error& failure) {
+      error = failure.what();
+    }
+    handler(std::move(source), error);
+  }
+};
+
+}  // namespace
+
+std::shared_ptr<OSLogEventStream> OSLogEventStream::initWithSource(
+    std::shared_ptr<OSLogEventSource> source) {
+  auto log = std::dynamic_pointer_cast<host::LogSource>(std::move(source));
+  if (log == nullptr) return nullptr;
+  try {
+    return std::make_shared<HostStream>(std::move(log));
+  } catch (const std::system_error&) {
+    return nullptr;
+  }
+}
+
+std::shared_ptr<OSLogEventStore> OSLogEventStore::localStore() {
+  return std::make_shared<HostStore>();
+}
