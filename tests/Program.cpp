@@ -1,0 +1,93 @@
+#include "tests/Program.h"
+
+#include <fcntl.h>
+#include <pty.h>
+#include <sys/wait.h>
+#include <termios.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <iterator>
+#include <ostream>
+
+ScratchFolder::ScratchFolder() {
+  std::string name = std::filesystem::temp_directory_path() / "zubtool-test-XXXXXX";
+  if (!mkdtemp(name.data())) throw std::system_error(errno, std::generic_category(), name);
+  folder = name;
+}
+
+ScratchFolder::~ScratchFolder() { std::filesystem::remove_all(folder); }
+
+std::string readFile(const std::string& path) {
+  std::ifstream stream(path, std::ios::binary);
+  return {std::istreambuf_iterator<char>(stream), {}};
+}
+
+void writeFile(const std::string& path, const std::string& text) {
+  std::ofstream(path, std::ios::binary) << text;
+}
+
+std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
+  return stream << "status " << outcome.status << "\n--- out\n"
+                << outcome.out << "--- err\n"
+                << outcome.err << "--- requests\n"
+                << outcome.requests;
+}
+
+Program::Program(const Start& start) {
+  writeFile(scratch->path("device"),
+            start.profile + "\nrequest-log = " + scratch->path("requests") + "\n");
+  if (start.input) writeFile(scratch->path("in"), *start.input);
+  termios plain{};  // no echo, no translation of line ends: the output is the program's own
+  cfmakeraw(&plain);
+  plain.c_lflag |= ICANON;
+  process = start.onTerminal ? forkpty(&terminal, nullptr, &plain, nullptr) : fork();
+  if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
+  if (process == 0) execute(start);
+  if (start.onTerminal) type(start.input.value_or(""));
+}
+
+void Program::execute(const Start& start) const {
+  const auto redirect = [this](int descriptor, const char* file, int flags) {
+    dup2(open(scratch->path(file).c_str(), flags | O_CLOEXEC, 0600), descriptor);
+  };
+  if (!start.onTerminal) {
+    if (start.input) redirect(STDIN_FILENO, "in", O_RDONLY);
+    if (!start.input) close(STDIN_FILENO);
+    redirect(STDOUT_FILENO, "out", O_WRONLY | O_CREAT);
+    redirect(STDERR_FILENO, "err", O_WRONLY | O_CREAT);
+  }
+  if (int ends[2]; start.readerGone && pipe2(ends, O_CLOEXEC) == 0) dup2(ends[1], STDOUT_FILENO);
+  setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
+  std::vector<char*> arguments = {const_cast<char*>(start.name.c_str())};
+  for (const auto& word : start.words) arguments.push_back(const_cast<char*>(word.c_str()));
+  arguments.push_back(nullptr);
+  execv(ZUBTOOL_PROGRAM, arguments.data());
+  _exit(127);
+}
+
+void Program::type(const std::string& text) const {
+  if (write(terminal, text.data(), text.size()) < 0) perror("terminal");
+}
+
+std::string Program::readUntil(const std::string& end) const {
+  std::string text;
+  for (char byte = 0; (end.empty() || !text.ends_with(end)) && read(terminal, &byte, 1) == 1;) {
+    text += byte;
+  }
+  return text;
+}
+
+Outcome Program::finish() {
+  Outcome outcome;
+  if (terminal >= 0) outcome.out = readUntil("");
+  int status = 0;
+  waitpid(process, &status, 0);
+  outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status);
+  if (terminal < 0) outcome.out = readFile(scratch->path("out"));
+  if (terminal >= 0) close(terminal);
+  outcome.err = readFile(scratch->path("err"));
+  outcome.requests = readFile(scratch->path("requests"));
+  return outcome;
+}

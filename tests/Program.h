@@ -1,0 +1,75 @@
+#pragma once
+
+#include <sys/types.h>
+
+#include <filesystem>
+#include <iosfwd>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+/// A folder of its own under the system's temporary folder, removed with all that is in it.
+class ScratchFolder {
+ public:
+  ScratchFolder();
+  ScratchFolder(const ScratchFolder&) = delete;
+  ScratchFolder& operator=(const ScratchFolder&) = delete;
+  ~ScratchFolder();
+
+  std::string path(const std::string& name) const { return folder / name; }
+
+ private:
+  std::filesystem::path folder;
+};
+
+std::string readFile(const std::string& path);
+void writeFile(const std::string& path, const std::string& text);
+
+/// One start of the real program.
+struct Start {
+  std::vector<std::string> words = {};               ///< after the program's name
+  std::string profile = {};                          ///< text of the device profile
+  std::optional<std::string> input = std::string();  ///< standard input; none: it is closed
+  std::string name = "zubtool";                      ///< under which the program is invoked
+  bool onTerminal = false;  ///< a pseudo-terminal stands for all three standard streams
+  bool readerGone = false;  ///< standard output is a pipe that nobody reads any more
+};
+
+/// What one run of the program left behind.
+struct Outcome {
+  std::string out = {};
+  std::string err = {};
+  int status = 0;  ///< exit status, or 1000 and the signal that ended it
+  std::string requests = {};
+
+  friend bool operator==(const Outcome&, const Outcome&) = default;
+};
+
+std::ostream& operator<<(std::ostream& stream, const Outcome& outcome);
+
+/// A started program.
+class Program {
+ public:
+  explicit Program(const Start& start);
+
+  /// Types `text` on its terminal.
+  void type(const std::string& text) const;
+
+  /// What it prints on its terminal up to and with `end`, or to its own end.
+  std::string readUntil(const std::string& end) const;
+
+  /// Waits for its end. Called once.
+  Outcome finish();
+
+  pid_t pid() const { return process; }
+
+ private:
+  [[noreturn]] void execute(const Start& start) const;
+
+  std::shared_ptr<ScratchFolder> scratch = std::make_shared<ScratchFolder>();
+  int terminal = -1;
+  pid_t process = -1;
+};
+
+inline Outcome run(const Start& start) { return Program(start).finish(); }

@@ -1,0 +1,291 @@
+// The exporter over a log store that each test scripts.
+
+#include <fcntl.h>
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdarg>
+#include <mutex>
+#include <thread>
+
+#include "oslog/OsLogStream.h"
+#include "platform/oslog_store.h"
+#include "tests/Program.h"
+
+struct OsLogStreamClock {
+  static bool put(std::chrono::nanoseconds timeout, const std::string& path,
+                  const std::list<std::string>& process, const std::list<std::string>& imagePath,
+                  double history) {
+    return OsLogStream::putWithin(timeout, path, process, imagePath, history);
+  }
+};
+
+namespace {
+
+using namespace std::chrono_literals;
+
+struct Event : OSLogEventProxy {
+  std::uint32_t kind = 1024;
+  std::int64_t at = 0;
+  std::int32_t zone = 0;
+  std::uint64_t thread = 0;
+  std::uint64_t activity = 0;
+  std::int32_t pid = 0;
+  std::string message = "m";
+
+  std::uint32_t type() const override { return kind; }
+  OSLogDate date() const override { return OSLogDate(at); }
+  OSLogTimeZone timeZone() const override { return OSLogTimeZone(zone); }
+  std::uint64_t threadIdentifier() const override { return thread; }
+  std::uint64_t activityIdentifier() const override { return activity; }
+  std::int32_t processIdentifier() const override { return pid; }
+  std::string_view process() const override { return "proc"; }
+  std::string_view sender() const override { return "image"; }
+  std::string_view subsystem() const override { return "sub.sys"; }
+  std::string_view category() const override { return "cat"; }
+  std::string_view composedMessage() const override { return message; }
+};
+
+/// What the store does in a test, and what it was asked.
+struct Script {
+  enum class Prepare { succeeds, fails, comesLate };
+  Prepare prepare = Prepare::succeeds;
+  std::vector<Event> events;
+  unsigned long reason = 5;
+  bool ends = true;
+  bool deliversOn = false;  ///< goes on with the last event until `stopped`, invalidated or not
+  std::string watched;      ///< a file whose content is noted along with some calls
+  std::atomic<bool> invalidated = false;
+  std::atomic<bool> stopped = false;
+  std::thread thread;
+  OSLogEventStore::PrepareHandler late;
+  OSLogDate start{0};
+
+  std::mutex mutex;
+  std::vector<std::string> calls;
+
+  void note(const std::string& call) {
+    const std::lock_guard lock(mutex);
+    calls.push_back(call);
+  }
+};
+
+Script* script = nullptr;
+
+class ScriptedStream : public OSLogEventStream {
+ public:
+  void setFlags(std::uint64_t flags) override {
+    script->note("flags " + std::to_string(flags) + " file:" + readFile(script->watched));
+  }
+  void setFilterPredicate(OSLogOrPredicate predicate) override {
+    for (const auto& [format, value] : predicate.terms) script->note(format + " " + value);
+  }
+  void setEventHandler(EventHandler handler) override {
+    script->note("event handler");
+    onEvent = std::move(handler);
+  }
+  void setInvalidationHandler(InvalidationHandler handler) override {
+    script->note("invalidation handler");
+    onEnd = std::move(handler);
+  }
+  void activateStreamFromDate(OSLogDate date) override {
+    script->note("activate");
+    script->start = date;
+    script->thread = std::thread([deliver = onEvent, end = onEnd] {
+      for (const auto& event : script->events) deliver(event);
+      while (script->deliversOn && !script->stopped) deliver(script->events.back());
+      while (!script->ends && !script->invalidated) std::this_thread::yield();
+      end(script->invalidated ? 1 : script->reason, {});
+    });
+  }
+  void invalidate() override { script->invalidated = true; }
+
+ private:
+  EventHandler onEvent;
+  InvalidationHandler onEnd;
+};
+
+class ScriptedStore : public OSLogEventStore {
+  void prepareWithCompletionHandler(PrepareHandler handler) override {
+    script->note("prepare file:" + readFile(script->watched));
+    if (script->prepare == Script::Prepare::comesLate) script->late = handler;
+    if (script->prepare == Script::Prepare::fails) handler(nullptr, "locked");
+    if (script->prepare == Script::Prepare::succeeds) {
+      handler(std::make_shared<OSLogEventSource>(), std::nullopt);
+    }
+  }
+};
+
+class OsLogStreamTest : public ::testing::Test, public Script {
+ protected:
+  OsLogStreamTest() {
+    script = this;
+    watched = output = folder.path("out");
+    events.resize(1);
+  }
+  ~OsLogStreamTest() override {
+    stopped = true;
+    if (thread.joinable()) thread.join();
+  }
+
+  bool put(std::chrono::nanoseconds timeout = 60s) {
+    return OsLogStreamClock::put(timeout, output, {}, {}, 0);
+  }
+
+  /// What stands in the system log, but for the line that each export writes.
+  std::vector<std::string> diagnostics() {
+    const std::lock_guard lock(mutex);
+    std::vector<std::string> found;
+    for (const auto& call : calls) {
+      if (call.starts_with("3:") && !call.starts_with("3:Getting")) found.push_back(call.substr(2));
+    }
+    return found;
+  }
+
+  ScratchFolder folder;
+  std::string output;
+  const std::string line = "1970-01-01 00:00:00 +0000 0x00000 0x0 0 proc(image):sub.sys [cat] m\n";
+};
+
+using Texts = std::vector<std::string>;
+
+TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
+  writeFile(output, "old");
+  const auto before = OSLogDate::now();
+  EXPECT_TRUE(OsLogStream::putOsLogStreamToFile(output, {"p1", "p2"}, {"I"}, 3600));
+  EXPECT_EQ(calls,
+            (Texts{"prepare file:old", "flags 21 file:", "process == %@ p1", "process == %@ p2",
+                   "senderImagePath CONTAINS[cd] %@ I", "event handler", "invalidation handler",
+                   "3:Getting oslog stream: history = 3600.000000", "activate"}));
+  EXPECT_GE(start, before.addingSeconds(-3600));
+  EXPECT_LE(start, OSLogDate::now().addingSeconds(-3600));
+  EXPECT_EQ(readFile(output), line);
+}
+
+TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {
+  events.resize(4);
+  events[0].kind = 1023;
+  events[1].at = 1'700'000'000'999'999;
+  events[1].zone = -5400;
+  events[1].thread = 0x1a;
+  events[1].activity = 0xABCDEF;
+  events[1].pid = -1;
+  events[1].message = "two\nlines";
+  events[2].at = -1;
+  events[2].thread = events[2].activity = ~0ULL;
+  events[2].pid = 2147483647;
+  events[2].message = std::string(100'000, 'x') + "ü";
+  events[3].kind = 0;
+  EXPECT_TRUE(put());
+  EXPECT_EQ(readFile(output),
+            "2023-11-14 20:43:20 +0000 0x0001a 0xabcdef -1 proc(image):sub.sys [cat] two\nlines\n"
+            "1969-12-31 23:59:59 +0000 0xffffffffffffffff 0xffffffffffffffff 2147483647 "
+            "proc(image):sub.sys [cat] " +
+                events[2].message + "\n");
+  EXPECT_EQ(diagnostics(), Texts());
+  EXPECT_EQ(calls[2], "event handler") << "no filter without names";
+}
+
+TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
+  prepare = Prepare::fails;
+  EXPECT_FALSE(put());
+  EXPECT_EQ(diagnostics(), (Texts{"Could not open: locked", "Failed to prepare oslog stream"}));
+  EXPECT_NE(access(output.c_str(), F_OK), 0) << "the file is made only for a stream";
+  calls.clear();
+  prepare = Prepare::comesLate;
+  EXPECT_FALSE(put());
+  late(std::make_shared<OSLogEventSource>(), std::nullopt);
+  EXPECT_EQ(diagnostics(), Texts{"Failed to prepare oslog stream"});
+  prepare = Prepare::succeeds;
+  const auto unreadPipe = folder.path("pipe");
+  ASSERT_EQ(mkfifo(unreadPipe.c_str(), 0600), 0);
+  for (const auto& path : {folder.path(""), folder.path("no/such"), unreadPipe}) {
+    calls.clear();
+    output = path;
+    EXPECT_FALSE(put());
+    EXPECT_EQ(diagnostics(), Texts{"Failed to create file: " + path});
+  }
+}
+
+TEST_F(OsLogStreamTest, IsTrueForAStreamThatEndsForAnotherReason) {
+  reason = 7;
+  EXPECT_TRUE(put());
+  EXPECT_EQ(diagnostics(), Texts{"Invalid oslog stream: reason = 7"});
+  EXPECT_EQ(readFile(output), line);
+}
+
+TEST_F(OsLogStreamTest, StopsWhenALineCannotBeWritten) {
+  output = "/dev/full";
+  events.resize(3);
+  EXPECT_FALSE(put());
+  EXPECT_TRUE(invalidated);
+  EXPECT_EQ(diagnostics(),
+            (Texts{"Failed to write file: /dev/full", "Invalid oslog stream: reason = 1"}));
+}
+
+TEST_F(OsLogStreamTest, GivesUpOnAStreamThatDoesNotEnd) {
+  ends = false;
+  EXPECT_FALSE(put(50ms));
+  EXPECT_TRUE(invalidated);
+  thread.join();
+  EXPECT_EQ(readFile(output), line);
+  auto found = diagnostics();  // written by two threads
+  std::ranges::sort(found);
+  EXPECT_EQ(found,
+            (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
+}
+
+TEST_F(OsLogStreamTest, WritesNothingToAFileThatItHasClosed) {
+  deliversOn = true;
+  EXPECT_FALSE(put(20ms));
+  const auto written = readFile(output);
+  std::this_thread::sleep_for(20ms);  // the store goes on delivering all the while
+  stopped = true;
+  thread.join();
+  const auto later = readFile(output);
+  EXPECT_LE(later.size(), written.size() + line.size()) << "but for a line that was under way";
+  EXPECT_TRUE(later.ends_with(line));
+}
+
+TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
+  output = folder.path("pipe");
+  ASSERT_EQ(mkfifo(output.c_str(), 0600), 0);
+  const int reader = open(output.c_str(), O_RDONLY | O_NONBLOCK);
+  events[0].message.assign(1 << 20, 'x');
+  EXPECT_FALSE(put(50ms));
+  std::string text(4, ' ');
+  EXPECT_EQ(read(reader, text.data(), 4), 4);
+  EXPECT_EQ(text, "1970");
+  std::thread drain([reader] {
+    char piece[65536];
+    fcntl(reader, F_SETFL, 0);
+    while (read(reader, piece, sizeof piece) > 0) {
+    }
+  });
+  thread.join();
+  drain.join();
+  close(reader);
+}
+
+}  // namespace
+
+std::shared_ptr<OSLogEventStore> OSLogEventStore::localStore() {
+  return std::make_shared<ScriptedStore>();
+}
+
+std::shared_ptr<OSLogEventStream> OSLogEventStream::initWithSource(
+    std::shared_ptr<OSLogEventSource> /*source*/) {
+  return std::make_shared<ScriptedStream>();
+}
+
+/// Stands in for syslog(3): notes "PRIORITY:text".
+extern "C" void syslog(int priority, const char* format, ...) {
+  char text[1000];
+  va_list arguments;
+  va_start(arguments, format);
+  vsnprintf(text, sizeof text, format, arguments);
+  va_end(arguments);
+  script->note(std::to_string(priority) + ":" + text);
+}

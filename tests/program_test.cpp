@@ -1,0 +1,150 @@
+// The real program, from its command line and its device to what it prints, asks and returns.
+
+#include <gtest/gtest.h>
+#include <sys/resource.h>
+
+#include <filesystem>
+#include <map>
+#include <sstream>
+
+#include "tests/Program.h"
+
+namespace {
+
+struct Case {
+  std::string what;
+  Start start;
+  Outcome expected;
+};
+
+std::string unescaped(const std::string& text) {
+  std::string plain;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    if (text[i] != '\\') {
+      plain += text[i];
+      continue;
+    }
+    const char code = text.at(++i);
+    plain += code == 'e' ? '\033' : code == 't' ? '\t' : code;
+  }
+  return plain;
+}
+
+/// Takes one line of a case; false for one that means nothing.
+bool readLine(Case& one, std::string key, const std::string& text) {
+  auto& start = one.start;
+  const std::map<std::string, std::string*> texts = {{"device", &start.profile},
+                                                     {"in", start.input ? &*start.input : nullptr},
+                                                     {"out", &one.expected.out},
+                                                     {"err", &one.expected.err},
+                                                     {"request", &one.expected.requests}};
+  const std::map<std::string, bool*> switches = {{"terminal", &start.onTerminal},
+                                                 {"no-reader", &start.readerGone}};
+  if (const auto on = switches.find(key); on != switches.end()) return *on->second = true;
+  if (key == "no-input") return start.input.reset(), true;
+  if (key == "word") return start.words.push_back(text), true;
+  if (key == "name") return start.name = text, true;
+  if (key == "status") return one.expected.status = std::stoi(text), true;
+  if (key == "words") {
+    std::istringstream words(text);
+    for (std::string word; words >> word;) start.words.push_back(word);
+    return true;
+  }
+  const bool endsLine = !key.ends_with('+');
+  if (!endsLine) key.pop_back();
+  const auto target = texts.find(key);
+  if (target == texts.end() || !target->second) return false;
+  *target->second += unescaped(text) + (endsLine ? "\n" : "");
+  return true;
+}
+
+/// The cases of a file; tests/cases/startup.cases tells the format.
+std::vector<Case> readCases(const std::string& file) {
+  std::vector<Case> cases;
+  std::istringstream stream(readFile(file));
+  for (std::string line; std::getline(stream, line);) {
+    if (line.empty() || line.starts_with('#')) continue;
+    const auto blank = std::min(line.find(' '), line.size() - 1);
+    const auto key = line.substr(0, line[blank] == ' ' ? blank : line.size());
+    const auto text = line.substr(blank + 1);
+    if (key == "==")
+      cases.emplace_back().what = text;
+    else if (cases.empty() || !readLine(cases.back(), key, text))
+      ADD_FAILURE() << file << ": " << line;
+  }
+  return cases;
+}
+
+class ProgramCases : public ::testing::TestWithParam<std::string> {};
+
+TEST_P(ProgramCases, LeaveBehindWhatTheyShould) {
+  const auto cases =
+      readCases(std::string(ZUBTOOL_SOURCES "/tests/cases/") + GetParam() + ".cases");
+  EXPECT_FALSE(cases.empty());
+  std::vector<Program>
+      programs;  // all at once: each waits half a second for the server's first word
+  for (const auto& one : cases) programs.emplace_back(one.start);
+  for (std::size_t i = 0; i < cases.size(); ++i) {
+    EXPECT_EQ(programs[i].finish(), cases[i].expected) << cases[i].what;
+  }
+}
+
+std::vector<std::string> caseFiles() {
+  std::vector<std::string> names;
+  for (const auto& file : std::filesystem::directory_iterator(ZUBTOOL_SOURCES "/tests/cases")) {
+    names.push_back(file.path().stem());
+  }
+  return names;
+}
+
+INSTANTIATE_TEST_SUITE_P(Files, ProgramCases, ::testing::ValuesIn(caseFiles()),
+                         [](const auto& file) { return file.param; });
+
+TEST(Program, FollowsTheServerWhileItPrompts) {
+  const std::string down = "Server is not running. Please try after server starts.\n";
+  Program program({.profile = "server = 2000 Started, 3000 Stopped", .onTerminal = true});
+  const auto tryCore = [&program] {
+    program.type("logdump core\n");
+    return program.readUntil(">> ");
+  };
+  EXPECT_EQ(program.readUntil(">> "), "(/zubtool)>> ");
+  EXPECT_EQ(tryCore(), down + "(/zubtool)>> ");
+  while (tryCore().starts_with(down)) {
+  }
+  while (!tryCore().starts_with(down)) {
+  }
+  program.type("exit\n");
+  EXPECT_EQ(program.finish().status, 0);
+}
+
+TEST(Program, SaysWhatIsWrongWithAProfile) {
+  for (const auto* const profile : {"radio = one", "\n# radio = x\nradio 1"}) {
+    const auto outcome = run({{"help"}, profile});
+    EXPECT_EQ(outcome.status, 255) << profile;
+    EXPECT_EQ(outcome.out, "") << profile;
+    const auto line = profile[0] == 'r' ? ":1: 'radio' takes" : ":3: neither 'key = value'";
+    EXPECT_NE(outcome.err.find(line), std::string::npos) << outcome.err;
+  }
+}
+
+TEST(Program, EndsWhenTheShellThreadCannotStart) {
+  rlimit before{};
+  ASSERT_EQ(getrlimit(RLIMIT_STACK, &before), 0);
+  const rlimit huge = {1UL << 46, before.rlim_max};  // a thread's stack has this size by default
+  if (setrlimit(RLIMIT_STACK, &huge) != 0) GTEST_SKIP() << "the stack's limit is fixed";
+  const auto outcome = run({{"help"}});
+  setrlimit(RLIMIT_STACK, &before);
+  EXPECT_EQ(outcome, (Outcome{.err = "Cannot start the shell thread: Resource temporarily "
+                                     "unavailable\n",
+                              .status = 255}));
+}
+
+TEST(Program, ExitsWhileTheQueueStillWorks) {
+  std::string steps = "server = 0 Started";
+  for (int i = 0; i < 4000; ++i) steps += ", " + std::to_string(400 + i / 20) + " Started";
+  std::vector<Program> programs;
+  for (int i = 0; i < 8; ++i) programs.emplace_back(Start{{"--"}, steps});
+  for (auto& program : programs) EXPECT_EQ(program.finish(), Outcome());
+}
+
+}  // namespace
