@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
 #include <iostream>
 #include <sstream>
@@ -7,6 +8,7 @@
 
 #include "framework/CommandShell.h"
 #include "framework/WordList.h"
+#include "tests/Table.h"
 
 namespace {
 
@@ -114,90 +116,32 @@ class TestShell : public CommandShell {
   }
 };
 
-/// The program's name and `words`, as a word list.
-Words commandLine(const std::vector<const char*>& words) {
-  std::vector<const char*> arguments = {"r"};
-  arguments.insert(arguments.end(), words.begin(), words.end());
-  return CommandShell::convertCmdArgsToList(static_cast<int>(arguments.size()), arguments.data());
+/// The program's name and the words of `line`, as a word list; '' is an empty word, and _ a blank.
+Words commandLine(const std::string& line) {
+  auto words = convertLineToList("r " + line);
+  for (auto& word : words) {
+    std::ranges::replace(word, '_', ' ');
+    if (word == "''") word.clear();
+  }
+  return words;
 }
 
-TEST(Shell, OneShot) {
-  const struct {
-    std::vector<const char*> words;
-    std::string output;
-    bool result;
-  } cases[] = {
-      {{"a", "", "x y", "--z"}, "?a /r:a(<><x y><--z>) ", true},
-      {{"f"}, "?f /r:f() ", false},
-      {{"nohandler", "x"}, "?nohandler ", false},
-      {{"nosub", "a"}, "?nosub ", false},
-      {{"both", "x"}, "?both /r:both(<x>) ", true},
-      {{"s", "t", "a", "help"}, "?s ?t ?a /r/s/t:a(<help>) ", true},
-      {{"s"}, "?s help /r/s ", false},
-      {{"help"}, "help /r ", true},
-      {{"s", "t", "help"}, "?s ?t help /r/s/t ", true},
-      {{"s", "help"}, "?s ?help /r/s:help() ", true},
-      {{"help", "s"}, "\nInvalid command option '\033[31mhelp\033[39m'help /r ", false},
-      {{"A"}, "\nInvalid command option '\033[31mA\033[39m'help /r ", false},
-      {{"s", "t", ""}, "?s ?t \nInvalid command option '\033[31m\033[39m'help /r/s/t ", false},
-      {{"back"}, "", true},
-      {{"s", "t", "back"},
-       "?s ?t \nInvalid command option '\033[31mback\033[39m'help /r/s/t ",
-       false},
-      {{"quit", "now"}, "\nInvalid command option '\033[31mquit\033[39m'help /r ", false},
-      {{"s", "quit"}, "?s ?quit /r/s:quit() ", true},
-      {{"exit", "--", "f"}, "", true},
-      {{"a", "--", "quit", "--", "f"}, "?a /r:a() ", true},
-      {{"--"}, "", true},
-      {{"--", "s", "a", "--", "--", "a", "---", "--"}, "?s ?a /r/s:a() ?a /r:a(<--->) ", true},
-      {{"f", "--", "a"}, "?f /r:f() ", false},
-      {{"a", "--", "f", "--", "a"}, "?a /r:a() ?f /r:f() ", false},
-      {{"cd", "s", "--", "a"}, "?a /r:a() ", true},
-      {{"s", "cd", "t"}, "?s ", true},
-      {{"cd", "nosub"}, "", true},
-      {{"cd", "s/t/bogus/.."}, "help /r/s/t ", false},
-      {{"cd"}, "help /r ", false},
-      {{"cd", "s", "t"}, "help /r ", false},
-      {{"cd", ""}, "", true},
-      {{"cd", " s//t /../.. .."}, "", true},
-  };
-  for (const auto& [words, output, result] : cases) {
-    const CapturedOutput out;
-    EXPECT_EQ(TestShell().run(commandLine(words)), result) << ::testing::PrintToString(words);
-    EXPECT_EQ(out.str(), output) << ::testing::PrintToString(words);
+TEST(Shell, RunsCommandLinesAndTypedLines) {
+  for (const std::string table : {"shell-words", "shell-lines"}) {
+    const bool isTyped = table == "shell-lines";
+    for (const auto& row : readTable(table, 3)) {
+      const CapturedOutput out;
+      const TypedInput in(isTyped ? row[0] : "");
+      EXPECT_EQ(TestShell().run(commandLine(isTyped ? "" : row[0])), row[2] == "true") << row[0];
+      EXPECT_EQ(out.str(), row[1]) << row[0];
+    }
   }
 }
 
-TEST(Shell, Interactive) {
-  const struct {
-    std::string input;
-    std::string output;
-    bool result;
-  } cases[] = {
-      {"", "(/r)>> ", false},
-      {"\n \t\v\r\f \nquit\nf\n", "(/r)>> (/r)>> (/r)>> ", true},
-      {"f\nexit", "(/r)>> ?f /r:f() (/r)>> ", true},
-      {"a x", "(/r)>> ?a /r:a(<x>) (/r)>> ", false},
-      {"f -- a\na -- a\n", "(/r)>> ?f /r:f() (/r)>> ?a /r:a() ?a /r:a() (/r)>> ", false},
-      {"a \"x\\ y\" #\n", "(/r)>> ?a /r:a(<\"x\\><y\"><#>) (/r)>> ", false},
-      {"cd s\na\ncd /t\nback\nback\nback\n",
-       "(/r)>> (/r/s)>> ?a /r/s:a() (/r/s)>> (/r/s/t)>> (/r/s)>> (/r)>> (/r)>> ", false},
-      {"s t a\na\n", "(/r)>> ?s ?t ?a /r/s/t:a() (/r)>> ?a /r:a() (/r)>> ", false},
-      {"s -- a\n", "(/r)>> ?s help /r/s (/r)>> ", false},
-      {"s cd t\n", "(/r)>> ?s (/r/s/t)>> ", false},
-      {"cd s/t/..\ncd ../..\n", "(/r)>> (/r/s)>> (/r)>> ", false},
-      {"cd s/x/t\ncd /\ncd s t\n", "(/r)>> help /r/s (/r)>> (/r)>> help /r (/r)>> ", false},
-      {"..\n", "(/r)>> \nInvalid command option '\033[31m..\033[39m'help /r (/r)>> ", false},
-      {std::string("a\0b\xff\n", 5),
-       std::string("(/r)>> \nInvalid command option '\033[31ma\0b\xff\033[39m'help /r (/r)>> ", 62),
-       false},
-  };
-  for (const auto& [input, output, result] : cases) {
-    const CapturedOutput out;
-    const TypedInput in(input);
-    EXPECT_EQ(TestShell().run(commandLine({})), result) << input;
-    EXPECT_EQ(out.str(), output) << input;
-  }
+TEST(Shell, TakesArgumentsAsTheyAre) {
+  const char* const arguments[] = {"/bin/r", "", "a  b", "--"};
+  EXPECT_EQ(CommandShell::convertCmdArgsToList(4, arguments), (Words{"--", "a  b", "", "/bin/r"}));
+  EXPECT_EQ(CommandShell::convertCmdArgsToList(0, arguments), Words());
 }
 
 TEST(Shell, NeedsATreeButNoProgramName) {
@@ -205,7 +149,7 @@ TEST(Shell, NeedsATreeButNoProgramName) {
   const TypedInput in("quit\n");
   TestShell treeless;
   treeless.hasTree = false;
-  EXPECT_FALSE(treeless.run(commandLine({})));
+  EXPECT_FALSE(treeless.run({"r"}));
   EXPECT_EQ(out.str(), "");
   EXPECT_TRUE(TestShell().run({}));
   EXPECT_EQ(out.str(), "(/r)>> ");
@@ -231,22 +175,7 @@ TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
       true);
   const CapturedOutput out(true);
   root->displayHelp();
-  const std::string indent(16, ' ');
-  EXPECT_EQ(out.str(),
-            "\n$Options for command '\033[32mroot\033[39m':\n$\n$"
-            "\t               Z  -  upper case first\n$\n$"
-            "\t               b  -  [x|y] does b\n$\n$"
-            "\texactly16letters  -  ...\n$\n$"
-            "\tseventeen-letters  -  ...\n$\n$"
-            "\t" +
-                indent +
-                "     <deep>  -  [p|q]\n$"
-                "\t" +
-                indent + indent +
-                "     <deeper>  -  [r]\n$\n$"
-                "\t               z  -  [only]\n$\n$"
-                "\t              cd  -  <sub-command>\n$"
-                "\t            help\n$\t            back\n$\t            quit\n$\n$");
+  EXPECT_EQ(out.str(), readTable("help", 1)[0][0]);
 }
 
 TEST(Command, RegistersAndLooksUp) {

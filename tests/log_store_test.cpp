@@ -9,6 +9,7 @@
 #include <filesystem>
 #include <fstream>
 #include <limits>
+#include <map>
 #include <stdexcept>
 #include <thread>
 
@@ -22,16 +23,19 @@
 #include "platform/host/StreamEnd.h"
 #include "platform/host/Utf8.h"
 #include "platform/oslog_store.h"
+#include "tests/Program.h"
+#include "tests/Table.h"
 
 using namespace std::chrono_literals;
 using namespace std::string_literals;
 using host::EntryReader;
 using Texts = std::vector<std::string>;
-namespace fs = std::filesystem;
 
 namespace {
 
 const std::string kDate = "__REALTIME_TIMESTAMP=1700000000000000\n";
+
+const std::string kForged = "x\n\nMESSAGE=forged\n" + kDate + "\n";
 
 /// An entry's binary field, whose declared length may be another than its own.
 std::string binary(const std::string& name, const std::string& value, std::uint64_t length) {
@@ -81,73 +85,35 @@ std::string summary(const OSLogEventProxy& event) {
 }
 
 TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
-  const std::string all =
-      "LOG_TYPE=7\nTID=1\n_PID=2\nSYSLOG_PID=3\nLOG_ACTIVITY=4\n_COMM=c\n_EXE=/x/e\n"
-      "SYSLOG_IDENTIFIER=i\nLOG_SENDER_PATH=/y/s\nLOG_SUBSYSTEM=b\n_SYSTEMD_UNIT=u\n"
-      "_TRANSPORT=t\nLOG_CATEGORY=g\nMESSAGE=m\nLOG_GMTOFF=-3600\n";
-  struct Case {
-    std::string fields, event;
-  };
-  const std::vector<Case> cases = {
-      {all, "7 1 4 2|c|s|b|g|m@-3600"},
-      {"MESSAGE=m\n", "1024 0 0 0|||||m@0"},
-      {"_PID=2\nSYSLOG_PID=3\n_EXE=/x/e\nSYSLOG_IDENTIFIER=i\n_SYSTEMD_UNIT=u\n_TRANSPORT=t\n",
-       "1024 2 0 2|i|e|u|i|@0"},
-      {"SYSLOG_PID=3\n_COMM=c\n_TRANSPORT=t\n", "1024 0 0 3|c|c|t||@0"},
-      {"_COMM=c\n_EXE=/x/\n", "1024 0 0 0|c|c|||@0"},
-      {"_COMM=a-long-process-\n_EXE=/x/a-long-process-name\n",
-       "1024 0 0 0|a-long-process-name|a-long-process-name|||@0"},
-      {"_COMM=a-long-process\n_EXE=/x/a-long-process-name\n",
-       "1024 0 0 0|a-long-process|a-long-process-name|||@0"},
-      {"_COMM=long-process-na\n_EXE=/x/long-process-name\n",
-       "1024 0 0 0|long-process-name|long-process-name|||@0"},
-      {"LOG_SUBSYSTEM=\n_SYSTEMD_UNIT=u\n", "1024 0 0 0|||||@0"},
-      {"LOG_TYPE=1x\nTID=-1\n_PID=2147483648\nSYSLOG_PID=3\nLOG_ACTIVITY=\nLOG_GMTOFF=86401\n",
-       "1024 2147483648 0 3|||||@0"},
-      {"LOG_GMTOFF=86400\n_COMM=\xFF\nMESSAGE=a\xE2\x82z\n",
-       "1024 0 0 0|\uFFFD|\uFFFD|||a\uFFFDz@86400"},
-  };
-  for (const auto& test : cases) {
-    const std::string log = kDate + test.fields + '\n';
+  for (const auto& row : readTable("event-fields", 2)) {
+    const std::string log = kDate + row[0] + '\n';
     Pieces source(log, 1);
     EntryReader reader(source);
     ASSERT_EQ(reader.next(), EntryReader::Result::entry);
-    EXPECT_EQ(summary(host::LogEvent(reader.entry())), test.event) << test.fields;
+    EXPECT_EQ(summary(host::LogEvent(reader.entry())), row[1]) << row[0];
   }
 }
 
 TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
-  const std::string good = kDate + "MESSAGE=m\n\n";
-  const std::string forged = "x\n\nMESSAGE=forged\n" + kDate + "\n";
-  struct Case {
+  const std::map<char, std::string> parts = {{'D', kDate},
+                                             {'G', kDate + "MESSAGE=m\n\n"},
+                                             {'N', std::string(255, 'A')},
+                                             {'F', binary("MESSAGE", kForged)},
+                                             {'O', binary("OTHER", kForged)},
+                                             {'S', binary("MESSAGE", "xyz", 2)},
+                                             {'C', binary("X", "", EntryReader::kMaxField + 1)},
+                                             {'L', binary("X", "", ~0ULL)}};
+  for (const auto& row : readTable("damage", 2)) {
     std::string log;
-    Texts seen;
-  };
-  const std::vector<Case> cases = {
-      {"", {"end"}},
-      {"\n\n" + good + "\n" + good, {"m", "m", "end"}},
-      {"-- Reboot --\n" + good + "-- Boot 1 --\n" + good, {"m", "m", "end"}},
-      {"MESSAGE=a\nMESSAGE=b\n" + kDate + kDate + "MESSAGE=c\n\n", {"a", "end"}},
-      {kDate + binary("MESSAGE", forged) + "\n" + good, {forged, "m", "end"}},
-      {kDate + binary("OTHER", forged) + binary("MESSAGE", "") + "\n", {"", "end"}},
-      {"MESSAGE=a\n\n__REALTIME_TIMESTAMP=x\n\n__REALTIME_TIMESTAMP=-1\n\n" + good, {"m", "end"}},
-      {"__REALTIME_TIMESTAMP=253402300799999999\n\n", {"", "end"}},
-      {"__REALTIME_TIMESTAMP=253402300800000000\n\n", {"end"}},
-      {good + "-- cut", {"m", "cut off in an entry"}},
-      {good + "-x\n" + good, {"m", "not a field name"}},
-      {kDate + "-- Reboot --\n\n", {"not a field name"}},
-      {good + "=x\n\n", {"m", "not a field name"}},
-      {good + "text=x\n\n", {"m", "not a field name"}},
-      {good + std::string(255, 'A') + "=x\n\n", {"m", "end"}},
-      {good + std::string(256, 'A') + "=x\n\n", {"m", "a field name is too long"}},
-      {good + kDate + binary("MESSAGE", "xyz", 2) + "\n",
-       {"m", "no newline behind a binary field"}},
-      {good + binary("X", "", EntryReader::kMaxField + 1), {"m", "a field is too long"}},
-      {good + binary("X", "", ~0ULL), {"m", "a field is too long"}},
-  };
-  for (const auto& test : cases) {
-    EXPECT_EQ(readAll(test.log), test.seen) << test.log;
-    EXPECT_EQ(readAll(test.log, 1), test.seen) << test.log;
+    for (std::size_t i = 0; i < row[0].size(); ++i) {
+      log += row[0][i] == '%' ? parts.at(row[0][++i]) : row[0].substr(i, 1);
+    }
+    for (const std::size_t piece : {std::size_t{1}, log.size() + 1}) {
+      std::string seen;
+      for (const auto& text : readAll(log, piece))
+        seen += (text == kForged ? "FORGED" : text) + "; ";
+      EXPECT_EQ(seen, row[1] + "; ") << row[0];
+    }
   }
 }
 
@@ -187,80 +153,25 @@ TEST(RecordedLog, LongFieldsAreWholeUpToTheCap) {
 }
 
 TEST(Text, Utf8IsRepairedByMaximalSubparts) {
-  struct Case {
-    std::string bytes, text;
-  };
-  const std::vector<Case> cases = {
-      {"seven b\xC3\xA9", "seven b\xC3\xA9"},
-      {"\xF4\x8F\xBF\xBF", "\xF4\x8F\xBF\xBF"},
-      {"a\x80z", "a\uFFFDz"},
-      {"\xC0\xAF", "\uFFFD\uFFFD"},
-      {"\xE0\x9F\x80", "\uFFFD\uFFFD\uFFFD"},
-      {"\xED\xA0\x80", "\uFFFD\uFFFD\uFFFD"},
-      {"\xF0\x9F\x98z", "\uFFFDz"},
-      {"\xF4\x90\x80\x80", "\uFFFD\uFFFD\uFFFD\uFFFD"},
-      {"12345678\xE2\x82", "12345678\uFFFD"},
-      {"\xF5", "\uFFFD"},
-  };
-  for (const auto& test : cases) {
+  for (const auto& row : readTable("utf8", 2)) {
     std::string storage;
-    EXPECT_EQ(host::asUtf8(test.bytes, storage), test.text);
-    EXPECT_EQ(host::isUtf8(test.bytes), test.bytes == test.text) << test.text;
+    EXPECT_EQ(host::asUtf8(row[0], storage), row[1]);
+    EXPECT_EQ(host::isUtf8(row[0]), row[0] == row[1]) << row[1];
   }
 }
 
 TEST(Text, FoldingIgnoresCaseAndDiacritics) {
-  struct Case {
-    const char *fragment, *text;
-    bool contained;
-  };
-  const std::vector<Case> cases = {
-      {"Modemcore", "/usr/lib/modemcore/x", true},
-      {"modem", "/x/MODEM", true},
-      {"modemx", "/x/modem", false},
-      {"", "", true},
-      {"\u0301", "", true},
-      {"é", "E\u0301", true},
-      {"e", "/\u00C9/", true},
-      {"e\u0301a", "ÉÀ", true},
-      {"Łódź", "/LODZ", true},
-      {"ø", "o", true},
-      {"ẞ", "ß", true},
-      {"ß", "ss", false},
-      {"Æ", "ǽ", true},
-      {"æ", "ae", false},
-      {"\u0253", "\u0181", true},
-      {"ẚỹ", "AY", true},
-      {"Ж", "ж", false},
-      {"\xFF", "\uFFFD", true},
-      {"@", "`", false},
-      {"z", "Z\u0370", true},
-  };
-  for (const auto& test : cases) {
-    EXPECT_EQ(host::FoldedText(test.fragment).isIn(test.text), test.contained) << test.fragment;
+  for (const auto& row : readTable("folding", 3)) {
+    EXPECT_EQ(host::FoldedText(row[0]).isIn(row[1]), row[2] == "true") << row[0];
   }
 }
 
 TEST(Text, DatesHaveTheirDefaultForm) {
   using Limits = std::numeric_limits<std::int64_t>;
-  struct Case {
-    std::int64_t microseconds;
-    const char* text;
-  };
-  const std::vector<Case> cases = {
-      {0, "1970-01-01 00:00:00 +0000"},
-      {-1, "1969-12-31 23:59:59 +0000"},
-      {951'868'799'999'999, "2000-02-29 23:59:59 +0000"},
-      {4'107'542'400'000'000, "2100-03-01 00:00:00 +0000"},
-      {253'402'300'800'000'000, "10000-01-01 00:00:00 +0000"},
-      {-62'167'219'200'000'001, "-0001-12-31 23:59:59 +0000"},
-      {Limits::max(), "294247-01-10 04:00:54 +0000"},
-      {Limits::min(), "-290308-12-21 19:59:05 +0000"},
-  };
-  for (const auto& test : cases) {
+  for (const auto& row : readTable("dates", 2)) {
     std::string text;
-    OSLogDate(test.microseconds).appendDescription(text);
-    EXPECT_EQ(text, test.text);
+    OSLogDate(std::stoll(row[0])).appendDescription(text);
+    EXPECT_EQ(text, row[1]);
   }
   const OSLogDate date(5);
   EXPECT_EQ(date.addingSeconds(-0.29), OSLogDate(5 - 290'000));
@@ -271,20 +182,16 @@ TEST(Text, DatesHaveTheirDefaultForm) {
 }
 
 TEST(Text, TheLocalZoneHasItsSummerTime) {
-  // On a thread of its own, which has not asked before; and back, for the tests that follow.
-  const auto inZone = [](const char* zone, auto body) {
-    setenv("TZ", zone, 1);
-    tzset();
-    std::thread(body).join();
-    unsetenv("TZ");
-    tzset();
-  };
-  inZone("CET-1CEST,M3.5.0,M10.5.0/3", [] {
+  setenv("TZ", "CET-1CEST,M3.5.0,M10.5.0/3", 1);
+  tzset();
+  std::thread([] {  // one that has not asked before
     const OSLogTimeZone local;
     EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'846'799'999'999)), 3'600);
     EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'846'800'000'000)), 7'200);
-    EXPECT_EQ(OSLogTimeZone(-60).secondsFromGMT(OSLogDate(0)), -60);
-  });
+  })
+      .join();
+  unsetenv("TZ");
+  tzset();
 }
 
 /// What a stream has delivered: the summaries, and the reason of its end.
@@ -295,16 +202,14 @@ struct Delivered {
 
 class LogStore : public testing::Test {
  protected:
-  LogStore() { fs::create_directories(folder); }
   ~LogStore() override {
-    fs::remove_all(folder);
     host::device() = device;
     setenv("PATH", path.c_str(), 1);
   }
 
   std::string write(const std::string& name, const std::string& text, mode_t mode = 0644) {
-    std::string file = folder + "/" + name;
-    std::ofstream(file, std::ios::binary) << text;
+    std::string file = scratch.path(name);
+    writeFile(file, text);
     chmod(file.c_str(), mode);
     return file;
   }
@@ -356,7 +261,8 @@ class LogStore : public testing::Test {
     return delivered;
   }
 
-  const std::string folder = testing::TempDir() + "log_store." + std::to_string(getpid());
+  const ScratchFolder scratch;
+  const std::string folder = std::filesystem::path(scratch.path("file")).parent_path();
   const std::string path = getenv("PATH");
   const host::Profile device = host::device();
 };
@@ -412,6 +318,7 @@ TEST_F(LogStore, SaysWhyItCannotBePrepared) {
 
   const std::string file = write("system.journal", "", 0);
   const bool isRoot = geteuid() == 0;
+  chmod(folder.c_str(), 0755);
   ASSERT_TRUE(!isRoot || seteuid(65534) == 0);
   EXPECT_EQ(prepareError(folder), "Cannot read the journal: " + file +
                                       ": Permission denied. Run as "
@@ -429,26 +336,11 @@ TEST_F(LogStore, SaysWhyItCannotBePrepared) {
 TEST_F(LogStore, AJournalctlThatFailsIsNoEndOfTheLog) {
   write("x.journal", "");
   write("log", kDate + "_COMM=a\n\n");
-  struct Case {
-    const char* script;
-    unsigned long reason;
-    std::size_t stopAt;
-  };
-  const std::vector<Case> cases = {
-      {"cat log", kOSLogEventStreamEndOfLog, 0},
-      {"cat log; exit 1", host::kStreamUnreadable, 0},
-      {"cat log; kill -9 $$", host::kStreamUnreadable, 0},
-      {"cat log; echo ignoring a file >&2", host::kStreamUnreadable, 0},
-      {"cat log; head -c 200000 /dev/zero >&2", host::kStreamUnreadable, 0},
-      {"cat log; printf MESSAGE=cut", host::kStreamDamaged, 0},
-      {"cat log; exec sleep 1000", host::kStreamInvalidated, 1},
-      {"trap '' TERM; cat log; while :; do sleep 0.01; done", host::kStreamInvalidated, 1},
-  };
-  for (const auto& test : cases) {
-    installJournalctl(test.script);
-    const Delivered delivered = run(stream(folder), test.stopAt);
-    EXPECT_EQ(delivered.events.size(), 1) << test.script;
-    EXPECT_EQ(delivered.reason, test.reason) << test.script;
+  for (const auto& row : readTable("journalctl", 3)) {
+    installJournalctl(row[0]);
+    const Delivered delivered = run(stream(folder), std::stoul(row[2]));
+    EXPECT_EQ(delivered.events.size(), 1) << row[0];
+    EXPECT_EQ(delivered.reason, std::stoul(row[1])) << row[0];
   }
 }
 
@@ -456,26 +348,17 @@ TEST_F(LogStore, JournalctlIsAskedForLittleMoreThanIsWanted) {
   write("x.journal", "");
   installJournalctl("for word; do echo \"$word\"; done > words");
   const std::string common = "--quiet\n--no-pager\n--output=export\n--directory=" + folder + "\n";
-  struct Case {
-    std::vector<OSLogPredicate> filter;
-    std::int64_t from;
-    std::string words;
-  };
-  const std::vector<Case> cases = {
-      {{{"process == %@", "a"}, {"process == %@", "a-long-process-name"}},
-       1'999'999,
-       "--since=@1\n_COMM=a\n_COMM=a-long-process-\n+\nSYSLOG_IDENTIFIER=a\n"
-       "SYSLOG_IDENTIFIER=a-long-process-name\n"},
-      {{{"process == %@", "a"}, {"senderImagePath CONTAINS[cd] %@", "b"}}, 0, ""},
-      {{{"process == %@", "\uFFFD"}}, -5'000'000, ""},
-  };
-  for (const auto& test : cases) {
+  const auto check = [&](OSLogOrPredicate filter, std::int64_t from, const std::string& more) {
     const auto asked = stream(folder);
-    asked->setFilterPredicate({test.filter});
-    run(asked, 0, OSLogDate(test.from));
-    std::ifstream words(folder + "/words");
-    EXPECT_EQ(std::string(std::istreambuf_iterator<char>(words), {}), common + test.words);
-  }
+    asked->setFilterPredicate(std::move(filter));
+    run(asked, 0, OSLogDate(from));
+    EXPECT_EQ(readFile(folder + "/words"), common + more);
+  };
+  check({{{"process == %@", "a"}, {"process == %@", "a-long-process-name"}}}, 1'999'999,
+        "--since=@1\n_COMM=a\n_COMM=a-long-process-\n+\nSYSLOG_IDENTIFIER=a\n"
+        "SYSLOG_IDENTIFIER=a-long-process-name\n");
+  check({{{"process == %@", "a"}, {"senderImagePath CONTAINS[cd] %@", "b"}}}, 0, "");
+  check({{{"process == %@", "\uFFFD"}}}, -5'000'000, "");
 }
 
 TEST_F(LogStore, RealJournalFilesGiveWhatTheyWereMadeFrom) {

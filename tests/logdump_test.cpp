@@ -6,61 +6,20 @@
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
 #include "platform/host/Device.h"
+#include "tests/Table.h"
 #include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"
 
 namespace {
 
 TEST(TraceProperty, ReadsWordsAndNumbers) {
-  using Mode = std::optional<std::int32_t>;
-  using Flag = std::optional<bool>;  // none: left as it was
-  const struct {
-    std::string value;
-    Mode mode;
-    Flag flag;
-  } cases[] = {
-      {"FALSE", 0, false},
-      {"oFf", 0, false},
-      {"no", 0, false},
-      {"True", 1, true},
-      {"oN", 1, true},
-      {"YES", 1, true},
-      {"Full", 1, true},
-      {"LITE", 2, true},
-      {"lite ", {}, {}},
-      {" on", {}, {}},
-      {"", {}, {}},
-      {" ", {}, {}},
-      {"0", 0, false},
-      {"-0", 0, false},
-      {"1", 1, true},
-      {" \t\n+1", 1, true},
-      {"0x1", 1, true},
-      {"01", 1, true},
-      {"1 ", {}, {}},
-      {"1.0", {}, {}},
-      {std::string("1\0", 2), {}, {}},
-      {"-1", -1, {}},
-      {"2", 2, {}},
-      {"0x2", 2, {}},
-      {"010", 8, {}},
-      {"08", {}, {}},
-      {"0x", {}, {}},
-      {"2abc", {}, {}},
-      {"2147483647", 2147483647, {}},
-      {"-2147483648", std::numeric_limits<std::int32_t>::min(), {}},
-      {"2147483648", {}, {}},
-      {"-2147483649", {}, {}},
-      {"4294967297", {}, {}},
-      {"18446744073709551617", {}, {}},
-      {"-9223372036854775809", {}, {}},
-  };
-  for (const auto& [value, mode, flag] : cases) {
-    EXPECT_EQ(parseTraceMode(value), mode) << '"' << value << '"';
+  for (const auto& row : readTable("trace-property", 3)) {
+    const auto mode = parseTraceMode(row[0]);
+    EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]) << '"' << row[0] << '"';
     for (const bool before : {false, true}) {
       bool after = before;
-      parseBoolProperty(value, after);
-      EXPECT_EQ(after, flag.value_or(before)) << '"' << value << '"';
+      parseBoolProperty(row[0], after);
+      EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true") << '"' << row[0] << '"';
     }
   }
 }

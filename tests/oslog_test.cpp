@@ -15,10 +15,8 @@
 #include "tests/Program.h"
 
 struct OsLogStreamClock {
-  static bool put(std::chrono::nanoseconds timeout, const std::string& path,
-                  const std::list<std::string>& process, const std::list<std::string>& imagePath,
-                  double history) {
-    return OsLogStream::putWithin(timeout, path, process, imagePath, history);
+  static bool put(std::chrono::nanoseconds timeout, const std::string& path) {
+    return OsLogStream::putWithin(timeout, path, {}, {}, 0);
   }
 };
 
@@ -131,7 +129,7 @@ class OsLogStreamTest : public ::testing::Test, public Script {
   }
 
   bool put(std::chrono::nanoseconds timeout = 60s) {
-    return OsLogStreamClock::put(timeout, output, {}, {}, 0);
+    return OsLogStreamClock::put(timeout, output);
   }
 
   /// What stands in the system log, but for the line that each export writes.
@@ -233,8 +231,7 @@ TEST_F(OsLogStreamTest, GivesUpOnAStreamThatDoesNotEnd) {
   EXPECT_EQ(readFile(output), line);
   auto found = diagnostics();  // written by two threads
   std::ranges::sort(found);
-  EXPECT_EQ(found,
-            (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
+  EXPECT_EQ(found, (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
 }
 
 TEST_F(OsLogStreamTest, WritesNothingToAFileThatItHasClosed) {

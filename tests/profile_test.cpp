@@ -5,6 +5,7 @@
 #include <filesystem>
 
 #include "tests/Program.h"
+#include "tests/Table.h"
 
 namespace {
 
@@ -53,30 +54,9 @@ TEST(Profile, SetsEachKey) {
 }
 
 TEST(Profile, RefusesWhatItDoesNotUnderstand) {
-  const std::pair<std::string_view, std::string_view> cases[] = {
-      {"\n\nraido = 1", "dir/p.device:3: unknown key 'raido'"},
-      {"radio", "dir/p.device:1: neither 'key = value' nor a comment: 'radio'"},
-      {"radio =", "dir/p.device:1: 'radio' takes a whole number, not ''"},
-      {"radio = 1x", "dir/p.device:1: 'radio' takes a whole number, not '1x'"},
-      {"radio = 2147483648", "dir/p.device:1: 'radio' takes a whole number, not '2147483648'"},
-      {"radio = 1\nqdss = no\nradio = 2", "dir/p.device:3: 'radio' is set on line 1 already"},
-      {"qdss = Yes", "dir/p.device:1: 'qdss' takes yes or no, not 'Yes'"},
-      {"log = \xff", "dir/p.device:1: not UTF-8 text"},
-      {"product = watch",
-       "dir/p.device:1: 'product' takes a whole number or a product's name, "
-       "not 'watch'"},
-      {"dump = !0", "dir/p.device:1: 'dump' takes ok, !CODE (not 0), !null or !empty, not '!0'"},
-      {"dump = !4294967296",
-       "dir/p.device:1: 'dump' takes ok, !CODE (not 0), !null or !empty, not '!4294967296'"},
-      {"dump-delay = -1", "dir/p.device:1: 'dump-delay' takes milliseconds, not '-1'"},
-  };
-  for (const auto& [text, wrong] : cases) {
+  for (const auto& row : readTable("profile-errors", 2)) {
     Profile profile;
-    EXPECT_EQ(parse(text, profile).value_or("good"), wrong);
-  }
-  for (const auto* const steps : {"5", "x Started", "0 Started,", "9 A, 8 B", ", 0 A", "0  "}) {
-    Profile profile;
-    EXPECT_TRUE(parse(std::string("server = ") + steps, profile)) << steps;
+    EXPECT_EQ(parse(row[0], profile).value_or("good"), "dir/p.device:" + row[1]);
   }
 }
 

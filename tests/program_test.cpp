@@ -8,6 +8,7 @@
 #include <sstream>
 
 #include "tests/Program.h"
+#include "tests/Table.h"
 
 namespace {
 
@@ -16,19 +17,6 @@ struct Case {
   Start start;
   Outcome expected;
 };
-
-std::string unescaped(const std::string& text) {
-  std::string plain;
-  for (std::size_t i = 0; i < text.size(); ++i) {
-    if (text[i] != '\\') {
-      plain += text[i];
-      continue;
-    }
-    const char code = text.at(++i);
-    plain += code == 'e' ? '\033' : code == 't' ? '\t' : code;
-  }
-  return plain;
-}
 
 /// Takes one line of a case; false for one that means nothing.
 bool readLine(Case& one, std::string key, const std::string& text) {
