@@ -28,7 +28,7 @@ template <class Work, class Floor>
 void compare(benchmark::State& state, Work&& work, Floor&& floor) {
   std::vector<double> floors;
   std::vector<double> ratios;
-  for (auto _ : state) {
+  for ([[maybe_unused]] auto _ : state) {
     const double seconds = secondsOf(work);
     floors.push_back(secondsOf(floor));
     ratios.push_back(seconds / floors.back());

@@ -2,11 +2,11 @@
 
 #include <benchmark/benchmark.h>
 #include <fcntl.h>
-#include <stdlib.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 
@@ -93,7 +93,7 @@ void BM_Export(benchmark::State& state) {
 
 void BM_ExportMemory(benchmark::State& state) {
   const Folder folder(state.range(0));
-  for (auto _ : state) state.counters["peak_MiB"] = peakMemory(folder);
+  for ([[maybe_unused]] auto _ : state) state.counters["peak_MiB"] = peakMemory(folder);
 }
 
 #define SIZES Arg(10'000)->Arg(100'000)->Arg(1'000'000)

@@ -21,7 +21,7 @@ constexpr int kLines = 200'000;
 class EmptyCommand : public CommandBase {
  public:
   static std::shared_ptr<CommandBase> create() {
-    const std::shared_ptr<CommandBase> node(new EmptyCommand("zubtool", {}));
+    std::shared_ptr<CommandBase> node(new EmptyCommand("zubtool", {}));
     node->init();
     return node;
   }
@@ -153,7 +153,7 @@ BENCHMARK(BM_GroupHandOver)->UseManualTime()->Iterations(11)->Unit(benchmark::kM
 void BM_StartUp(benchmark::State& state) {
   constexpr double kServerWait = 0.5;
   std::vector<double> beyond;
-  for (auto _ : state) {
+  for ([[maybe_unused]] auto _ : state) {
     const double seconds = bench::secondsOf([] {
       char name[] = "zubtool";
       char nothing[] = "--";

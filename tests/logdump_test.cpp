@@ -2,6 +2,7 @@
 
 #include <thread>
 
+#include "framework/WordList.h"
 #include "logdump/LogdumpOptions.h"
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
@@ -25,49 +26,29 @@ TEST(TraceProperty, ReadsWordsAndNumbers) {
 }
 
 TEST(LogdumpOptions, TakeWordsInAnyOrderUpToTheReason) {
-  using enum CompressionMode;
-  const struct {
-    std::list<std::string> words;  // reversed, as every word list
-    CompressionMode mode;
-    std::string reason;
-    bool noUi;
-  } cases[] = {
-      {{}, tar, "[zubtool] User triggered", false},
-      {{"crash", "NonUI", "TAR.GZ"}, tarGz, "[zubtool] crash", true},
-      {{"nocompress", "tar"}, none, "[zubtool] User triggered", false},
-      {{"tar.gz", "nocompress", "nonui", "nonui"}, tarGz, "[zubtool] User triggered", true},
-      {{"nonui", "nocompress", "tar.gz2"}, tar, "[zubtool] tar.gz2", false},
-      {{""}, tar, "[zubtool] ", false},
-  };
-  for (const auto& [words, mode, reason, noUi] : cases) {
-    auto parsedMode = tar;
-    std::string parsedReason = "before";
-    bool parsedNoUi = false;
-    parseLogdumpOptions(words, parsedMode, parsedReason, parsedNoUi);
-    EXPECT_EQ(parsedMode, mode) << reason;
-    EXPECT_EQ(parsedReason, reason);
-    EXPECT_EQ(parsedNoUi, noUi) << reason;
+  for (const auto& row : readTable("options", 4)) {
+    auto mode = CompressionMode::tar;
+    std::string reason = "before";
+    bool noUi = false;
+    parseLogdumpOptions(convertLineToList(row[0]), mode, reason, noUi);
+    EXPECT_EQ(std::to_string(static_cast<int>(mode)), row[1]) << row[0];
+    EXPECT_EQ(reason, row[2]) << row[0];
+    EXPECT_EQ(noUi, row[3] == "true") << row[0];
   }
 }
 
 TEST(TraceNames, FollowTheVendorAndTheCoreDumpSuffixOnlyOnce) {
   auto& vendor = host::device().radioVendor;
-  const auto before = vendor;
   vendor = kTelephonyRadioVendorKOV;
-  std::vector<std::string> suffixes(4);
-  {
-    std::vector<std::jthread> callers;
-    for (auto& suffix : suffixes) {
-      callers.emplace_back([&suffix] { suffix = zub::trace::getCoreDumpDirSuffix(); });
-    }
-  }
-  EXPECT_EQ(suffixes, std::vector<std::string>(4, "-coredump"));
+  std::string concurrent;
+  std::thread other([&concurrent] { concurrent = zub::trace::getCoreDumpDirSuffix(); });
+  EXPECT_EQ(zub::trace::getCoreDumpDirSuffix(), "-coredump");
+  other.join();
+  EXPECT_EQ(concurrent, "-coredump");
   EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-bb-trace");
-  vendor = 0;
+  vendor = host::Profile().radioVendor;
   EXPECT_EQ(zub::trace::getCoreDumpDirSuffix(), "-coredump");
   EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-qdss");
-  EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(false), "-diag");
-  vendor = before;
 }
 
 TEST(ServerState, RunsOnlyInTheStartedState) {
