@@ -1,0 +1,77 @@
+#!/usr/bin/env bash
+# Installs the tool into a scratch root, and from its Debian package into another, and tries both.
+# usage: tests/install_test.sh BUILD_FOLDER   (a folder that has been built)
+set -euo pipefail
+
+build=$(cd "$1" && pwd)
+sources=$(cd "$(dirname "$0")/.." && pwd)
+scratch=$(mktemp -d)
+trap 'rm -rf "$scratch"' EXIT
+cd "$scratch"
+umask 022
+
+fail() {
+  echo "install_test: $*" >&2
+  exit 1
+}
+
+# The files of an installation, with their modes.
+expected() {
+  local share=usr/share file
+  printf '%s\n' '755 usr/bin/zubtool' "644 $share/man/man1/zubtool.1.gz" \
+    "644 $share/man/man5/zub-device.5.gz" "644 $share/bash-completion/completions/zubtool" \
+    "644 $share/zsh/vendor-completions/_zubtool" \
+    "644 $share/fish/vendor_completions.d/zubtool.fish" "644 $share/doc/zubtool/README.md"
+  for file in "$sources"/devices/*; do echo "644 $share/zubtool/devices/${file##*/}"; done
+}
+
+check_files() {  # ROOT
+  diff <(expected | sort -k 2) <(cd "$1" && find usr -type f -printf '%m %p\n' | sort -k 2) >&2 ||
+    fail "$1 does not hold the files it should (<), but others (>)"
+  ! find "$1/usr" -type d ! -perm 755 -printf '%m %p\n' | grep . >&2 || fail "$1 has such folders"
+  for page in "$1"/usr/share/man/*/*.gz; do
+    gzip -t "$page"
+    ! command -v mandoc >/dev/null || mandoc -T lint -W warning "$page" || fail "$page has faults"
+  done
+}
+
+# The program must live without the build folder.
+check_program() {  # ROOT
+  local program=$1/usr/bin/zubtool status=0 message
+  ! grep -aqF -e "$build" -e "$sources" "$program" || fail "$program names the build's folders"
+  ! readelf -d "$program" | grep -E 'RPATH|RUNPATH' >&2 || fail "$program has a run path"
+  env -i "$program" help >out || fail "'zubtool help' ends with status $?"
+  grep -q logdump out || fail "'zubtool help' prints: $(cat out)"
+  message=$(env -i ZUB_DEVICE="$1/usr/share/zubtool/devices/server-down.device" \
+    "$program" logdump tel 2>&1) || status=$?
+  [[ $status == 1 && $message == "Server is not running."* ]] ||
+    fail "with an installed profile: status $status, and: $message"
+}
+
+check_package() {  # FILE
+  local field
+  for field in 'Package: zubtool' 'Version: [0-9.]+' "Architecture: $(dpkg --print-architecture)" \
+    'Maintainer: .+ <.+@.+>' 'Section: utils' 'Priority: optional' 'Depends: .*libc6.*libstdc\+\+6' \
+    'Description: Diagnostic tool for .+'; do
+    dpkg-deb -f "$1" | grep -qE "^$field" || fail "${1##*/} has no '$field': $(dpkg-deb -f "$1")"
+  done
+  [[ ${1##*/} == zubtool_"$(dpkg-deb -f "$1" Version)"_"$(dpkg-deb -f "$1" Architecture)".deb ]] ||
+    fail "the package is called ${1##*/}"
+  ! dpkg-deb -c "$1" | grep -v ' root/root ' >&2 || fail "these are not root's"
+}
+
+DESTDIR=$scratch/installed cmake --install "$build" --prefix /usr --strip >log 2>&1 ||
+  fail "cmake --install: $(cat log)"
+check_files installed
+check_program "$scratch/installed"
+
+if ! command -v dpkg-deb >/dev/null || ! command -v dpkg-shlibdeps >/dev/null; then
+  echo "install_test: no package, for dpkg-deb or dpkg-shlibdeps is missing"
+  exit 0
+fi
+cpack -G DEB --config "$build/CPackConfig.cmake" -B "$scratch/package" >log 2>&1 ||
+  fail "cpack: $(cat log)"
+check_package package/*.deb
+dpkg-deb -x package/*.deb unpacked
+check_files unpacked
+check_program "$scratch/unpacked"
