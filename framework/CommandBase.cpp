@@ -37,6 +37,7 @@ bool CommandBase::execCommand(const std::string& word, const std::list<std::stri
   const auto found = commandHandlers.find(word);
   if (found == commandHandlers.end()) return false;
   const auto group = dispatch::group::create();
+  if (!group) return false;  // work on no group could not be waited for
   const bool succeeded = found->second(group, words);
   group.wait();
   return succeeded;

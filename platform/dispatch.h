@@ -60,7 +60,8 @@ class membership {
   group joined;
 };
 
-/// A reference-counted callable, which may hold none.
+/// A reference-counted callable, which may hold none: one made of a null pointer or of an empty
+/// `std::function` is empty.
 ///
 /// A copy is another reference to the same callable, never a copy of what the callable has
 /// captured; the captures are destroyed with the last reference. Calling an empty block is an
@@ -77,8 +78,10 @@ class block<Result(Arguments...)> {
 
   template <class Callable>
   requires(!std::is_same_v<Callable, block> &&
-           std::is_invocable_r_v<Result, Callable&, Arguments...>) block(Callable callable)
-      : body(std::make_shared<std::function<Result(Arguments...)>>(std::move(callable))) {}
+           std::is_invocable_r_v<Result, Callable&, Arguments...>) block(Callable callable) {
+    std::function<Result(Arguments...)> function(std::move(callable));
+    if (function) body = std::make_shared<decltype(function)>(std::move(function));
+  }
 
   explicit operator bool() const noexcept { return body != nullptr; }
 
@@ -92,12 +95,12 @@ class block<Result(Arguments...)> {
 
 /// Runs tasks one at a time, in the order in which they were given, on a thread of its own.
 ///
-/// A copy is another reference to the same queue; a default-made queue holds none and takes no
-/// tasks. Threads: every member may be called from any thread, tasks included; two tasks never
-/// overlap. Lifetime: tasks already given still run after the last reference has gone; each is
-/// released before the next one starts. At process exit, what has not run is dropped.
-/// Errors: a task must not throw; one that does ends the process. A queue whose thread cannot be
-/// started throws `std::system_error` when it is made.
+/// A copy is another reference to the same queue; a default-made queue holds none, and drops what
+/// it is given. Threads: every member may be called from any thread, tasks included; two tasks
+/// never overlap. Lifetime: tasks already given still run after the last reference has gone; each
+/// is released before the next one starts. At process exit, what has not run is dropped. Errors: a
+/// task must not throw; one that does ends the process. A queue whose thread cannot be started
+/// throws `std::system_error` when it is made.
 class queue {
  public:
   queue() = default;

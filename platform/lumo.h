@@ -12,7 +12,8 @@ namespace lumo {
 class object;
 struct entry;
 
-/// Text keys with their values, in the order in which the keys were first set.
+/// Text keys with their values, in the order in which the keys were first set. It owns the values:
+/// a reference to one is valid until the dictionary is changed or goes away.
 class dict {
  public:
   dict();

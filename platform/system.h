@@ -5,18 +5,18 @@
 #include <utility>
 
 /// The name under which the program was invoked, without its folder. Owned by the C library, as
-/// in getprogname(3) of the BSDs.
+/// in getprogname(3) of the BSDs. Any thread.
 extern "C" const char* getprogname();
 
 namespace platform {
 
-/// Runs the main thread's event loop, which serves the platform's callbacks. In practice it does
-/// not return.
+/// Runs the event loop of the main thread, the only one to call it, and serves the platform's
+/// callbacks. In practice it does not return.
 void runMainEventLoop();
 
 /// Sees to it that there is an empty file at `path`: makes one, or empties the one that is there.
 /// What is no regular file (a device, a pipe) is left as it is. Its failure shows when the file is
-/// opened.
+/// opened. Any thread.
 void createEmptyFile(const std::string& path);
 
 /// A file open for writing at its end. Move-only; closes when destroyed.

@@ -60,7 +60,8 @@ inline constexpr auto kResultServerNotRunning = static_cast<std::int32_t>(0xE020
 /// The client library of the baseband manager server.
 ///
 /// Threads: every function may be called from any thread. Handlers and completions run on the
-/// queue that the manager was made with, one at a time.
+/// queue that the manager was made with, one at a time. Errors: a request's are in its result; what
+/// the system cannot give, such as a thread, is thrown as `std::system_error`.
 namespace zub::client {
 
 /// One client's connection to the server. Opaque; shared by handle.
@@ -72,8 +73,8 @@ using EventHandler = dispatch::block<void(lumo::object payload, dispatch::group)
 /// Receives the result of a request and its reply, a dictionary on success.
 using Completion = dispatch::block<void(TelephonyLumo::Result result, lumo::object reply)>;
 
-/// Makes a manager for the client called `name`, whose callbacks run on `queue`. Never null. Its
-/// events are on, as after `EventsOn`.
+/// Makes a manager for the client that the server is to know as `name`, with callbacks on `queue`.
+/// Never null. Its events are on, as after `EventsOn`.
 std::shared_ptr<Manager> CreateManager(const std::string& name, dispatch::queue queue);
 
 /// Calls `handler` for each event of that name from now on. The library keeps its reference to the
@@ -88,8 +89,9 @@ void EventsOff(const std::shared_ptr<Manager>& manager);
 /// it anew; when they were on already, nothing happens.
 void EventsOn(const std::shared_ptr<Manager>& manager);
 
-/// Sends `command` with `request` and blocks until the answer is there. `*reply` holds the reply
-/// afterwards; the caller passes it in null and owns it. The library sets no limit to the wait.
+/// Sends `command` with `request` and blocks until the answer is there. `*reply`, which is the
+/// caller's and comes in as the null object, holds the reply afterwards; a request that failed
+/// leaves it null. The library sets no limit to the wait.
 TelephonyLumo::Result PerformCommand(const std::shared_ptr<Manager>& manager,
                                      const std::string& command, const lumo::dict& request,
                                      lumo::object* reply);

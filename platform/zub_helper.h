@@ -32,8 +32,9 @@ class HelperClient {
 
   virtual ~HelperClient() = default;
 
-  /// Performs one task and blocks until it is done. The caller passes `*reply` in as an empty
-  /// dictionary; it holds the reply afterwards. Call it on one thread at a time.
+  /// Performs one task and blocks until it is done. `*reply`, which is the caller's and comes in as
+  /// an empty dictionary, holds the reply afterwards; a task that failed leaves it empty. Call it
+  /// on one thread at a time.
   virtual TelephonyLumo::Result perform(helper::TaskID task, const std::string& command,
                                         const lumo::dict& parameters, lumo::object* reply) = 0;
 };

@@ -38,25 +38,33 @@ std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
 Program::Program(const Start& start) {
   writeFile(scratch->path("device"),
             start.profile + "\nrequest-log = " + scratch->path("requests") + "\n");
-  if (start.input) writeFile(scratch->path("in"), *start.input);
   termios plain{};  // no echo, no translation of line ends: the output is the program's own
   cfmakeraw(&plain);
   plain.c_lflag |= ICANON;
-  process = start.onTerminal ? forkpty(&terminal, nullptr, &plain, nullptr) : fork();
+  int input[2];
+  int output[2];
+  if (pipe2(input, O_CLOEXEC) != 0 || pipe2(output, O_CLOEXEC) != 0) throw std::bad_alloc();
+  process = start.onTerminal ? forkpty(&out, nullptr, &plain, nullptr) : fork();
   if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
-  if (process == 0) execute(start);
-  if (start.onTerminal) type(start.input.value_or(""));
+  if (process == 0) execute(start, input[0], output[1]);
+  close(input[0]);
+  close(output[1]);
+  in = start.onTerminal ? out : input[1];
+  if (start.onTerminal) {
+    close(input[1]);
+    close(output[0]);
+  } else {
+    out = output[0];
+  }
+  type(start.input.value_or(""));
 }
 
-void Program::execute(const Start& start) const {
-  const auto redirect = [this](int descriptor, const char* file, int flags) {
-    dup2(open(scratch->path(file).c_str(), flags | O_CLOEXEC, 0600), descriptor);
-  };
+void Program::execute(const Start& start, int input, int output) const {
   if (!start.onTerminal) {
-    if (start.input) redirect(STDIN_FILENO, "in", O_RDONLY);
+    dup2(input, STDIN_FILENO);
     if (!start.input) close(STDIN_FILENO);
-    redirect(STDOUT_FILENO, "out", O_WRONLY | O_CREAT);
-    redirect(STDERR_FILENO, "err", O_WRONLY | O_CREAT);
+    dup2(output, STDOUT_FILENO);
+    dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }
   if (int ends[2]; start.readerGone && pipe2(ends, O_CLOEXEC) == 0) dup2(ends[1], STDOUT_FILENO);
   setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
@@ -68,25 +76,24 @@ void Program::execute(const Start& start) const {
 }
 
 void Program::type(const std::string& text) const {
-  if (write(terminal, text.data(), text.size()) < 0) perror("terminal");
+  if (write(in, text.data(), text.size()) < 0) perror("standard input of the program");
 }
 
 std::string Program::readUntil(const std::string& end) const {
   std::string text;
-  for (char byte = 0; (end.empty() || !text.ends_with(end)) && read(terminal, &byte, 1) == 1;) {
+  for (char byte = 0; (end.empty() || !text.ends_with(end)) && read(out, &byte, 1) == 1;) {
     text += byte;
   }
   return text;
 }
 
 Outcome Program::finish() {
-  Outcome outcome;
-  if (terminal >= 0) outcome.out = readUntil("");
+  if (in != out) close(in);
+  Outcome outcome{.out = readUntil("")};
+  close(out);
   int status = 0;
   waitpid(process, &status, 0);
   outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status);
-  if (terminal < 0) outcome.out = readFile(scratch->path("out"));
-  if (terminal >= 0) close(terminal);
   outcome.err = readFile(scratch->path("err"));
   const auto folder = scratch->path("");  // of another name each time
   for (auto at = outcome.err.find(folder); at != std::string::npos; at = outcome.err.find(folder)) {

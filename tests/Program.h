@@ -48,27 +48,28 @@ struct Outcome {
 
 std::ostream& operator<<(std::ostream& stream, const Outcome& outcome);
 
-/// A started program.
+/// A started program. Its standard streams are pipes, or a terminal.
 class Program {
  public:
   explicit Program(const Start& start);
 
-  /// Types `text` on its terminal.
+  /// Writes `text` to its standard input; of small texts, all before it reads.
   void type(const std::string& text) const;
 
-  /// What it prints on its terminal up to and with `end`, or to its own end.
+  /// What it prints on standard output up to and with `end`, or to its own end.
   std::string readUntil(const std::string& end) const;
 
-  /// Waits for its end. Called once.
+  /// Ends its standard input and waits for its end. Called once.
   Outcome finish();
 
   pid_t pid() const { return process; }
 
  private:
-  [[noreturn]] void execute(const Start& start) const;
+  [[noreturn]] void execute(const Start& start, int input, int output) const;
 
   std::shared_ptr<ScratchFolder> scratch = std::make_shared<ScratchFolder>();
-  int terminal = -1;
+  int in = -1;  // the same as `out` where that is a terminal
+  int out = -1;
   pid_t process = -1;
 };
 

@@ -185,12 +185,16 @@ TEST(Command, RegistersAndLooksUp) {
         self.addCommandHandler("empty", {}, "help of nothing");
         self.handler("h", false, "first");
         self.handler("h", true);
+        self.handler("k", true, "earlier");
+        self.handler("k", true, "later");
+        self.addCommandHandler("null", std::function<bool(dispatch::group, Words)>(), "");
         self.child("c", [](Node&) {});
         self.child("c", [](Node&) {});
       },
       true);
   EXPECT_FALSE(node->isValidCommand("empty"));
   EXPECT_FALSE(node->isValidCommand("H"));
+  EXPECT_FALSE(node->isValidCommand("null"));
   EXPECT_EQ(node->getSubCommandObj("d"), nullptr);
   EXPECT_FALSE(node->isValidSubCommand("d"));
   EXPECT_EQ(node->getSubCommandObj("c")->getParent().lock(), node);
@@ -202,6 +206,10 @@ TEST(Command, RegistersAndLooksUp) {
   EXPECT_EQ(out.str(), "/r:h(<first><last>) ");
   node->displayHelp();
   EXPECT_NE(out.str().find("h  -  first\n"), std::string::npos) << "an empty help keeps the first";
+  EXPECT_NE(out.str().find("k  -  later\n"), std::string::npos);
+  const std::weak_ptr<CommandBase> gone = Node::create("gone", {}, [](Node&) {});
+  const auto orphan = Node::create("o", gone, [](Node&) {});
+  EXPECT_EQ(orphan->getHierarchy(), "/o");
 }
 
 TEST(Command, ReturnsWhenTheWorkOfItsHandlerHasEnded) {

@@ -3,8 +3,10 @@
 #include <gtest/gtest.h>
 #include <sys/resource.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <map>
+#include <set>
 #include <sstream>
 
 #include "tests/Program.h"
@@ -88,20 +90,29 @@ INSTANTIATE_TEST_SUITE_P(Files, ProgramCases, ::testing::ValuesIn(caseFiles()),
                          [](const auto& file) { return file.param; });
 
 TEST(Program, FollowsTheServerWhileItPrompts) {
-  const std::string down = "Server is not running. Please try after server starts.\n";
-  Program program({.profile = "server = 2000 Started, 3000 Stopped", .onTerminal = true});
-  const auto tryCore = [&program] {
+  const std::string prompt = "(/zubtool)>> ";
+  const std::string success =
+      "Telephony log collection with Coredump: Success\nPath = "
+      "/private/var/wireless/Library/Logs/CrashVault/Baseband/log-bb-T.tar.gz\n";
+  Program program({.profile = "server = 2000 Started\ndump-timestamp = T"});
+  EXPECT_EQ(program.readUntil(prompt), prompt);
+  int refused = 0;
+  for (bool isRefused = true; isRefused; refused += isRefused ? 1 : 0) {
     program.type("logdump core\n");
-    return program.readUntil(">> ");
-  };
-  EXPECT_EQ(program.readUntil(">> "), "(/zubtool)>> ");
-  EXPECT_EQ(tryCore(), down + "(/zubtool)>> ");
-  while (tryCore().starts_with(down)) {
+    const auto answer = program.readUntil(prompt);
+    isRefused = answer == prompt;
+    EXPECT_TRUE(isRefused || answer == success + prompt) << answer;
   }
-  while (!tryCore().starts_with(down)) {
+  std::set<std::string> threads;
+  for (const auto& task :
+       std::filesystem::directory_iterator("/proc/" + std::to_string(program.pid()) + "/task")) {
+    threads.insert(readFile(task.path() / "comm"));
   }
-  program.type("exit\n");
-  EXPECT_EQ(program.finish().status, 0);
+  EXPECT_TRUE(threads.contains("zubtool.queue\n"));
+  const auto outcome = program.finish();
+  EXPECT_GT(refused, 0);
+  EXPECT_EQ(std::ranges::count(outcome.err, '\n'), refused);
+  EXPECT_EQ(std::ranges::count(outcome.requests, '\n'), 1);
 }
 
 TEST(Program, EndsWhenTheShellThreadCannotStart) {

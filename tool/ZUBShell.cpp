@@ -1,5 +1,8 @@
 #include "tool/ZUBShell.h"
 
+#include <iostream>
+#include <system_error>
+
 #include "platform/system.h"
 #include "platform/zub_client.h"
 #include "tool/ServerState.h"
@@ -22,9 +25,8 @@ void followServerState(const std::shared_ptr<zub::client::Manager>& manager,
   zub::client::EventsOn(manager);
 }
 
-}  // namespace
-
-std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
+/// Connects to the server and builds the tree over that connection.
+std::shared_ptr<CommandBase> connect() {
   const dispatch::queue queue("zubtool.queue");
   const auto manager = zub::client::CreateManager("zubtool", queue);
   const auto group = dispatch::group::create();
@@ -36,4 +38,15 @@ std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
   // way the tool starts: commands that need the server ask for its state themselves.
   static_cast<void>(group.wait(kFirstStateWait));
   return ZUBCommand::create(getprogname(), {}, manager, queue);
+}
+
+}  // namespace
+
+std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
+  try {
+    return connect();
+  } catch (const std::system_error& failure) {
+    std::cerr << "Cannot connect to the server: " << failure.what() << std::endl;
+    return nullptr;
+  }
 }

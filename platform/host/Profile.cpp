@@ -128,7 +128,8 @@ bool readProcesses(std::string_view text, Profile& profile) {
   profile.processes.clear();
   profile.hostProcesses = false;
   while (!(text = trimmed(text)).empty()) {
-    const auto name = takePiece(text, text.find('\t') < text.find(' ') ? '\t' : ' ');
+    const auto name = text.substr(0, text.find_first_of(kBlanks));
+    text.remove_prefix(name.size());
     if (name == "@host") {
       profile.hostProcesses = true;
     } else {
@@ -145,7 +146,9 @@ bool readServer(std::string_view text, std::vector<ServerStep>& steps) {
   do {
     auto state = trimmed(takePiece(text, ','));
     ServerStep step;
-    if (!readMilliseconds(takePiece(state, ' '), step.at)) return false;
+    const auto blank = std::min(state.find_first_of(kBlanks), state.size());
+    if (!readMilliseconds(state.substr(0, blank), step.at)) return false;
+    state.remove_prefix(blank);
     step.state = trimmed(state);
     if (step.state.empty() || (!steps.empty() && step.at < steps.back().at)) return false;
     steps.push_back(std::move(step));
@@ -232,11 +235,12 @@ constexpr Key kKeys[] = {
 
 std::string quoted(std::string_view text) { return std::string("'").append(text).append("'"); }
 
-/// Reads one line, less its comment, into `profile`. Returns what is wrong, or an empty text.
+/// Reads one line into `profile`. Returns what is wrong, or an empty text.
 std::string readLine(std::string_view line, Profile& profile,
                      std::map<std::string_view, int>& firstLines, int number) {
-  if (line.empty()) return {};
   if (!isUtf8(line)) return "not UTF-8 text";
+  line = trimmed(line.substr(0, line.find('#')));
+  if (line.empty()) return {};
   const auto equals = line.find('=');
   if (equals == Text::npos) return "neither 'key = value' nor a comment: " + quoted(line);
   const auto name = trimmed(line.substr(0, equals));
@@ -257,8 +261,7 @@ std::optional<std::string> parseProfile(std::string_view text, const std::string
                                         Profile& profile) {
   std::map<std::string_view, int> firstLines;
   for (int number = 1; !text.empty(); ++number) {
-    auto line = takePiece(text, '\n');
-    const auto wrong = readLine(trimmed(takePiece(line, '#')), profile, firstLines, number);
+    const auto wrong = readLine(takePiece(text, '\n'), profile, firstLines, number);
     if (!wrong.empty())
       return (file + ":").append(std::to_string(number)).append(": ").append(wrong);
   }

@@ -8,8 +8,18 @@
 namespace host {
 namespace {
 
+/// `text` in quotes, on one line, and with no way to look like what stands around it.
+std::string quoted(const std::string& text) {
+  std::string line = "\"";
+  for (const char byte : text) {
+    if (byte == '"' || byte == '\\' || byte == '\n') line += '\\';
+    line += byte == '\n' ? 'n' : byte;
+  }
+  return line + '"';
+}
+
 std::string describe(const lumo::object& value) {
-  if (const auto* const text = value.as<std::string>()) return '"' + *text + '"';
+  if (const auto* const text = value.as<std::string>()) return quoted(*text);
   if (const auto* const flag = value.as<bool>()) return *flag ? "true" : "false";
   if (const auto* const number = value.as<std::int64_t>()) return std::to_string(*number);
   if (const auto* const entries = value.as<lumo::dict>()) return describe(*entries);

@@ -10,11 +10,12 @@
 /// What the simulated server and the simulated helper service have in common.
 namespace host {
 
-/// A request's dictionary as the request log shows it: "{Key="text", Other=1}".
+/// A request's dictionary as the request log shows it: {Key="text", Other=1}, with \", \\ and \n in
+/// texts.
 std::string describe(const lumo::dict& request);
 
 /// Answers a request as the profile says: `answer`'s fault if it is one, else success with
-/// {`key`=`value`} in `*reply`.
+/// {`key`=`value`} in `*reply`. An error leaves `*reply` as it was.
 TelephonyLumo::Result answerWith(const Answer& answer, std::string_view key, std::string value,
                                  lumo::object* reply);
 

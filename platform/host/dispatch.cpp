@@ -2,6 +2,7 @@
 
 #include <pthread.h>
 
+#include <algorithm>
 #include <condition_variable>
 #include <cstdlib>
 #include <deque>
@@ -49,8 +50,10 @@ void group::wait() const {
 
 bool group::wait(std::chrono::nanoseconds timeout) const {
   if (!state) return true;
+  constexpr std::chrono::nanoseconds kLongest = std::chrono::years(100);  // to which a clock adds
   std::unique_lock lock(state->mutex);
-  return state->left.wait_for(lock, timeout, [this] { return state->entered == 0; });
+  return state->left.wait_for(lock, std::min(timeout, kLongest),
+                              [this] { return state->entered == 0; });
 }
 
 namespace {
@@ -102,6 +105,7 @@ struct queue::Worker {
 queue::queue(std::string label) : worker(std::make_shared<Worker>(label)) {}
 
 void queue::async(block<void()> task) const {
+  if (!worker) return;
   const std::lock_guard lock(worker->tasks->mutex);
   worker->tasks->waiting.push_back(std::move(task));
   worker->tasks->changed.notify_one();

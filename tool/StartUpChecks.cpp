@@ -1,0 +1,23 @@
+#include "tool/StartUpChecks.h"
+
+#include "platform/telephony.h"
+#include "tool/Hardware.h"
+
+namespace {
+
+bool daemonsAreRunning() {
+  // Both are asked, whatever the first answer.
+  const bool telephony = tlu::isProcessRunning("Orvalind");
+  const bool watch = config::hw::watch();
+  return telephony || watch || tlu::isProcessRunning("modemd");
+}
+
+}  // namespace
+
+const char* whyNotToStart() {
+  if (TelephonyRadiosGetRadio() == 0) return "'zubtool' is not supported on this product.";
+  if (!daemonsAreRunning()) {
+    return "Orvalind process is not running. Please run/load Orvalind (or modemd) and try again.";
+  }
+  return nullptr;
+}
