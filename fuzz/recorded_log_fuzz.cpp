@@ -54,7 +54,7 @@ std::string read(std::string_view log, std::size_t piece, const host::EventFilte
     add(told, event.category());
     add(told, event.composedMessage());
     add(told, event.senderImagePath());
-    add(told, event.date().description());
+    event.date().appendDescription(told);
     told += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
     told += std::to_string(event.processIdentifier());
     told += std::to_string(event.timeZone().secondsFromGMT(event.date()));

@@ -1,8 +1,10 @@
 #include "logdump/TraceProperty.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <limits>
+#include <string_view>
 
 #include "platform/telephony.h"
 
@@ -23,11 +25,20 @@ Word readWord(const std::string& value) {
   return Word::none;
 }
 
+/// The base that the prefix of a number tells. Not left to strtoll, which knows more prefixes in
+/// newer C libraries.
+int baseOf(std::string_view number) {
+  number.remove_prefix(std::min(number.find_first_not_of(" \t\n\v\f\r"), number.size()));
+  if (number.starts_with('+') || number.starts_with('-')) number.remove_prefix(1);
+  if (number.starts_with("0x") || number.starts_with("0X")) return 16;
+  return number.starts_with('0') ? 8 : 10;
+}
+
 /// All of `value` as a signed 64-bit number.
 std::optional<std::int64_t> readNumber(const std::string& value) {
   char* end = nullptr;
   errno = 0;
-  const std::int64_t number = std::strtoll(value.c_str(), &end, 0);
+  const std::int64_t number = std::strtoll(value.c_str(), &end, baseOf(value));
   const bool isWhole = end != value.c_str() && end == value.c_str() + value.size();
   if (!isWhole || errno == ERANGE) return std::nullopt;
   return number;

@@ -16,7 +16,7 @@
 /// log to a handler, in the order of the log, from a date on, until the log ends or the stream is
 /// invalidated.
 
-/// A point in absolute time, to the microsecond.
+/// A point in absolute time, to the microsecond. Any thread.
 class OSLogDate {
  public:
   static OSLogDate now();
@@ -39,7 +39,8 @@ class OSLogDate {
   std::int64_t microseconds;
 };
 
-/// A time zone: a fixed offset, or this machine's local zone with its summer times.
+/// A time zone: a fixed offset, or this machine's local zone with its summer times. Any thread; a
+/// change of the local zone while the process runs need not be seen.
 class OSLogTimeZone {
  public:
   /// The machine's local zone.
@@ -109,7 +110,7 @@ inline constexpr unsigned long kOSLogEventStreamEndOfLog = 5;
 /// Threads: the two handlers run on a thread of the store's own, one call at a time. `invalidate`
 /// may be called from any thread, the handlers' included, at any time and more than once; the
 /// other members belong to the thread that made the stream. The stream may be released at any
-/// time; once activated it runs to its end all the same.
+/// time; once activated it runs to its end all the same, or to that of the process.
 class OSLogEventStream {
  public:
   using EventHandler = dispatch::block<void(const OSLogEventProxy&)>;

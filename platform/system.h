@@ -15,8 +15,8 @@ namespace platform {
 void runMainEventLoop();
 
 /// Sees to it that there is an empty file at `path`: makes one, or empties the one that is there.
-/// What is no regular file (a device, a pipe) is left as it is. Its failure shows when the file is
-/// opened. Any thread.
+/// What is no regular file (a device, a pipe) is left as it is. A failure is not told: what counts
+/// is whether the file can be opened then. Any thread.
 void createEmptyFile(const std::string& path);
 
 /// A file open for writing at its end. Move-only; closes when destroyed.
@@ -25,7 +25,7 @@ void createEmptyFile(const std::string& path);
 class FileHandle {
  public:
   /// Opens the existing file at `path`. The handle is empty when that is not possible, which
-  /// includes a pipe that nobody reads.
+  /// includes a pipe that nobody reads, and the recorded log that the device itself reads.
   static FileHandle openForAppending(const std::string& path);
 
   FileHandle(FileHandle&& other) noexcept : descriptor(std::exchange(other.descriptor, -1)) {}

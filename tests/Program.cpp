@@ -67,6 +67,7 @@ void Program::execute(const Start& start, int input, int output) const {
     dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }
   if (int ends[2]; start.readerGone && pipe2(ends, O_CLOEXEC) == 0) dup2(ends[1], STDOUT_FILENO);
+  setenv("TZ", "UTC", 1);
   setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
   std::vector<char*> arguments = {const_cast<char*>(start.name.c_str())};
   for (const auto& word : start.words) arguments.push_back(const_cast<char*>(word.c_str()));

@@ -38,13 +38,6 @@ TEST(Group, WaitEndsWithTheLastLeaveOnAnotherThread) {
   }
 }
 
-TEST(Group, OneThatHoldsNothingNeverBlocks) {
-  const dispatch::group empty;
-  const dispatch::membership member(empty);
-  empty.wait();
-  EXPECT_TRUE(empty.wait(1h));
-}
-
 TEST(Queue, RunsTasksInOrderAndReleasesEachBeforeTheNext) {
   const auto group = dispatch::group::create();
   const auto owned = std::make_shared<int>(0);

@@ -115,6 +115,21 @@ TEST(Program, FollowsTheServerWhileItPrompts) {
   EXPECT_EQ(std::ranges::count(outcome.requests, '\n'), 1);
 }
 
+TEST(Program, ExportsTheLogOfARealMachine) {
+  const ScratchFolder folder;
+  const std::string data = ZUBTOOL_SOURCES "/tests/data/machine.";
+  const Start start = {{"logdump", "oslog", "2147483647", folder.path("out"), "-p",
+                        "systemd-journald", "-i", "LOGGER", "python"},
+                       "log = " + data + "export"};
+  EXPECT_EQ(run(start), Outcome());
+  EXPECT_EQ(readFile(folder.path("out")), readFile(data + "txt"));
+  EXPECT_EQ(run({{"logdump", "oslog", "600", folder.path("out")}}), Outcome());
+  const auto sample = readFile(folder.path("out"));
+  EXPECT_EQ(std::ranges::count(sample, '\n'), 6) << sample;
+  const auto own = run({{"logdump", "oslog", "600", data + "export"}, "log = " + data + "export"});
+  EXPECT_EQ(own, Outcome{.status = 1}) << "the log itself is no place to export to";
+}
+
 TEST(Program, EndsWhenTheShellThreadCannotStart) {
   rlimit before{};
   ASSERT_EQ(getrlimit(RLIMIT_STACK, &before), 0);

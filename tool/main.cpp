@@ -24,8 +24,10 @@ extern "C" void* runShellThread(void* words) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  // A reader that goes away costs the output, not the collection or the exit status.
+  // A reader that goes away, or a limit to a file's size, costs the output, not the collection or
+  // the exit status.
   signal(SIGPIPE, SIG_IGN);
+  signal(SIGXFSZ, SIG_IGN);
   auto words = CommandShell::convertCmdArgsToList(argc, argv);
   if (const char* const why = whyNotToStart()) {
     std::cout << why << std::endl;

@@ -8,6 +8,10 @@
 #include <array>
 #include <cerrno>
 #include <csignal>
+#include <cstdlib>
+#include <mutex>
+#include <set>
+#include <string_view>
 #include <system_error>
 #include <thread>
 
@@ -21,6 +25,53 @@ constexpr std::chrono::milliseconds kBetweenLooks{1};
 
 void check(int error, const char* what) {
   if (error != 0) throw std::system_error(error, std::generic_category(), what);
+}
+
+/// The processes that run, for the exit of this one: the thread that would stop them may never get
+/// to it. Never destroyed, since threads outlive exit.
+class RunningProcesses {
+ public:
+  static RunningProcesses& all() {
+    static auto* const processes = [] {
+      std::atexit([] { all().kill(); });
+      return new RunningProcesses;
+    }();
+    return *processes;
+  }
+
+  void add(pid_t process) {
+    const std::lock_guard lock(mutex);
+    running.insert(process);
+  }
+
+  /// waitpid(2) for one of them, which is none of them any more once it has been reaped: from then
+  /// on its number may be another's.
+  pid_t reap(pid_t process, int& status, int options) {
+    const std::lock_guard lock(mutex);
+    const pid_t ended = ::waitpid(process, &status, options);
+    if (ended == process) running.erase(process);
+    return ended;
+  }
+
+ private:
+  void kill() {
+    const std::lock_guard lock(mutex);
+    for (const pid_t process : running) ::kill(process, SIGKILL);
+  }
+
+  std::mutex mutex;
+  std::set<pid_t> running;
+};
+
+/// The environment, without what would change what journalctl writes on standard error, which tells
+/// whether it has read everything.
+std::vector<char*> plainEnvironment() {
+  std::vector<char*> kept;
+  for (char** entry = environ; *entry != nullptr; ++entry) {
+    if (!std::string_view(*entry).starts_with("SYSTEMD_")) kept.push_back(*entry);
+  }
+  kept.push_back(nullptr);
+  return kept;
 }
 
 struct Pipe {
@@ -77,8 +128,9 @@ JournalProcess::JournalProcess(const std::vector<std::string>& arguments) {
   for (const std::string& word : arguments) words.push_back(const_cast<char*>(word.c_str()));
   words.push_back(nullptr);
   check(::posix_spawnp(&process, name.c_str(), &settings.actions, &settings.attributes,
-                       words.data(), environ),
+                       words.data(), plainEnvironment().data()),
         "journalctl");
+  RunningProcesses::all().add(process);
   standardOutput = std::move(output.reading);
   standardError = std::move(error.reading);
 }
@@ -88,7 +140,8 @@ JournalProcess::~JournalProcess() {
   ::kill(process, SIGTERM);
   if (succeeded(kTimeToStop)) return;
   ::kill(process, SIGKILL);
-  while (::waitpid(process, nullptr, 0) < 0 && errno == EINTR) {
+  int status = 0;
+  while (RunningProcesses::all().reap(process, status, 0) < 0 && errno == EINTR) {
   }
 }
 
@@ -106,7 +159,7 @@ std::optional<bool> JournalProcess::succeeded(std::chrono::milliseconds timeout)
   const Clock::time_point deadline = Clock::now() + timeout;
   while (!success) {
     int status = 0;
-    const pid_t ended = ::waitpid(process, &status, WNOHANG);
+    const pid_t ended = RunningProcesses::all().reap(process, status, WNOHANG);
     if (ended == process) {
       success = WIFEXITED(status) && WEXITSTATUS(status) == 0;
     } else if (ended < 0 && errno != EINTR) {

@@ -12,7 +12,8 @@
 namespace host {
 
 /// A journalctl that runs. It is found on the PATH and started without a shell, with nothing on its
-/// standard input and with the signals as a new process expects them.
+/// standard input, with the signals as a new process expects them, and without the SYSTEMD_
+/// variables of the environment. It does not outlive this process, should that exit first.
 ///
 /// Threads: one at a time.
 class JournalProcess {

@@ -62,7 +62,7 @@ class DescriptorBytes final : public ByteSource {
 };
 
 /// What a journalctl writes, which ends well only if the process does, without a complaint: it
-/// passes over files that it cannot read, and says so on standard error alone.
+/// passes over files that it cannot open, and says so on standard error alone.
 class JournalBytes final : public ByteSource {
  public:
   JournalBytes(const std::vector<std::string>& arguments, const StopSignal& signal)

@@ -27,7 +27,9 @@ inline constexpr std::chrono::milliseconds kJournalPatience = std::chrono::secon
 /// Makes a log ready to be read. `log` is one of
 /// - "sample": a handful of recent events that is built in;
 /// - "journal": this machine's journal, as journalctl reads it. All its files must be readable;
-/// - the path of a folder with journal files, of another machine for instance, read the same way;
+/// - the path of a folder with journal files, of another machine for instance, read the same way.
+///   What journalctl passes over in silence, such as bytes overwritten inside a file, is missing
+///   in silence here as well; journalctl --verify finds it;
 /// - the path of anything else: a recorded log. One that is no regular file, such as a pipe, can
 ///   be read once, and its end is the end of what writes to it.
 ///

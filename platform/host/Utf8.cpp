@@ -45,6 +45,7 @@ Sequence firstSequence(std::string_view text) {
 bool isAscii(std::string_view text) {
   constexpr std::uint64_t kHighBits = 0x8080808080808080U;
   std::uint64_t seen = 0;
+  if (text.empty()) return true;
   if (text.size() < sizeof seen) {
     std::memcpy(&seen, text.data(), text.size());
     return (seen & kHighBits) == 0;

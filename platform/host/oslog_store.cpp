@@ -29,19 +29,10 @@ struct Delivery {
   std::optional<unsigned long> reasonOfNormalEnd;
 };
 
-/// The bytes to read, or none when they cannot be had.
-std::unique_ptr<host::ByteSource> openSource(const Delivery& delivery) {
-  try {
-    return delivery.source->open(delivery.from, delivery.filter, *delivery.stop);
-  } catch (const std::system_error&) {
-    return nullptr;
-  }
-}
-
 /// Delivers what is wanted until the log ends or the stream is stopped, and returns the reason.
+/// Throws `std::system_error` when the reading cannot be begun.
 unsigned long deliverEvents(const Delivery& delivery) {
-  const auto bytes = openSource(delivery);
-  if (bytes == nullptr) return host::kStreamUnreadable;
+  const auto bytes = delivery.source->open(delivery.from, delivery.filter, *delivery.stop);
   host::ReadAhead reader(*bytes, [&delivery](const host::LogEntry& entry) {
     const host::LogEvent event(entry);
     return event.date() >= delivery.from && delivery.filter.passes(event);
@@ -71,7 +62,11 @@ void end(Delivery delivery, unsigned long reason) {
 
 /// The life of a stream's thread.
 void run(Delivery delivery) {
-  const unsigned long reason = deliverEvents(delivery);
+  unsigned long reason = host::kStreamUnreadable;
+  try {
+    reason = deliverEvents(delivery);
+  } catch (const std::system_error&) {  // the reason says so
+  }
   end(std::move(delivery), reason);
 }
 
