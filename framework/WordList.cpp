@@ -1,7 +1,6 @@
 #include "framework/WordList.h"
 
 #include <algorithm>
-#include <sstream>
 #include <utility>
 
 std::string takeNextWord(std::list<std::string>& words) {
@@ -11,9 +10,13 @@ std::string takeNextWord(std::list<std::string>& words) {
 }
 
 std::list<std::string> convertLineToList(const std::string& line) {
+  constexpr auto kWhiteSpace = " \t\n\v\f\r";  // of the "C" locale
   std::list<std::string> words;
-  std::istringstream stream(line);
-  for (std::string word; stream >> word;) words.push_front(word);
+  for (auto start = line.find_first_not_of(kWhiteSpace); start != std::string::npos;) {
+    const auto end = std::min(line.find_first_of(kWhiteSpace, start), line.size());
+    words.emplace_front(line, start, end - start);
+    start = line.find_first_not_of(kWhiteSpace, end);
+  }
   return words;
 }
 

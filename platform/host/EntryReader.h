@@ -69,7 +69,7 @@ struct LogEntry {
 /// Threads: one at a time. The source must outlive the reader.
 class EntryReader {
  public:
-  static constexpr std::size_t kBuffer = std::size_t{128} << 10;
+  static constexpr std::size_t kBuffer = std::size_t{256} << 10;
   static constexpr std::size_t kMaxName = 255;
   static constexpr std::size_t kMaxField = std::size_t{32} << 20;
   static constexpr std::size_t kMaxCopies = std::size_t{64} << 20;

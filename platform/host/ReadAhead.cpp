@@ -8,13 +8,17 @@ namespace {
 
 constexpr std::size_t kBatchBytes = EntryReader::kBuffer;
 
-std::size_t sizeOf(const LogEntry& entry) {
-  std::size_t size = 0;
-  for (const std::string_view value : entry.all()) size += value.size();
-  return size;
-}
-
 }  // namespace
+
+FinishedEvent::FinishedEvent(const LogEvent& event)
+    : thread(event.threadIdentifier()),
+      activity(event.activityIdentifier()),
+      moment(event.date()),
+      zone(event.timeZone()),
+      kind(event.type()),
+      pid(event.processIdentifier()),
+      texts{event.process(), event.sender(), event.subsystem(), event.category(),
+            event.composedMessage()} {}
 
 /// Hands over what has been read before it asks for more.
 class ReadAhead::Source final : public ByteSource {
@@ -22,7 +26,7 @@ class ReadAhead::Source final : public ByteSource {
   Source(ReadAhead& owner, ByteSource& bytes) : reader(owner), source(bytes) {}
 
   std::int64_t read(char* buffer, std::size_t size) override {
-    if (!reader.filling.entries.empty()) reader.handOver();
+    if (!reader.filling.events.empty()) reader.handOver();
     return source.read(buffer, size);
   }
 
@@ -44,37 +48,40 @@ ReadAhead::~ReadAhead() {
 }
 
 EntryReader::Result ReadAhead::next() {
-  while (given == taken.entries.size()) {
+  while (given == taken.events.size()) {
     if (taken.after != EntryReader::Result::entry) return taken.after;
     takeOver();
   }
-  current = taken.entries[given++];
+  ++given;
   return EntryReader::Result::entry;
 }
 
 void ReadAhead::readLog(ByteSource& source, const Wanted& wanted) {
   Source handingOver(*this, source);
   EntryReader reader(handingOver);
+  const LogEvent event(reader.entry());
   EntryReader::Result result = reader.next();
   for (; result == EntryReader::Result::entry; result = reader.next()) {
-    if (wanted(reader.entry())) add(reader.entry());
+    if (wanted(event)) add(event);
   }
   filling.after = result;
   handOver();
 }
 
-void ReadAhead::add(const LogEntry& entry) {
-  const std::size_t size = sizeOf(entry);
+void ReadAhead::add(const LogEvent& event) {
+  FinishedEvent finished(event);
+  std::size_t size = 0;
+  for (const std::string_view text : finished.allTexts()) size += text.size();
   if (filling.bytes.capacity() - filling.bytes.size() < size) {
-    if (!filling.entries.empty()) handOver();
+    if (!filling.events.empty()) handOver();
     filling.bytes.reserve(std::max(size, kBatchBytes));
   }
-  for (std::string_view& value : filling.entries.emplace_back(entry).all()) {
-    if (value.data() == nullptr) continue;
+  for (std::string_view& text : finished.allTexts()) {
     const std::size_t start = filling.bytes.size();
-    filling.bytes.insert(filling.bytes.end(), value.begin(), value.end());
-    value = {filling.bytes.data() + start, value.size()};
+    filling.bytes.insert(filling.bytes.end(), text.begin(), text.end());
+    text = {filling.bytes.data() + start, text.size()};
   }
+  filling.events.push_back(finished);
 }
 
 void ReadAhead::handOver() {
@@ -85,9 +92,9 @@ void ReadAhead::handOver() {
     isReady = true;
   }
   changed.notify_one();
-  filling.entries.clear();
+  filling.events.clear();
   filling.bytes.clear();
-  // What a huge entry has left behind is not held for good.
+  // What a huge event has left behind is not held for good.
   if (filling.bytes.capacity() > kBatchBytes) filling.bytes = std::vector<char>();
 }
 

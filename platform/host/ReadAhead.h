@@ -1,5 +1,6 @@
 #pragma once
 
+#include <array>
 #include <condition_variable>
 #include <functional>
 #include <mutex>
@@ -8,13 +9,45 @@
 
 #include "platform/host/ByteSource.h"
 #include "platform/host/EntryReader.h"
+#include "platform/host/LogEvent.h"
 
 namespace host {
 
-/// Reads a log on a thread of its own, a little ahead of whoever takes the entries: to read and to
-/// use a log take about as long, and can be done at the same time.
+/// An event with all its parts made out, apart from the entry that it came from. What its texts
+/// refer to belongs to whoever made it.
+class FinishedEvent final : public OSLogEventProxy {
+ public:
+  explicit FinishedEvent(const LogEvent& event);
+
+  std::uint32_t type() const override { return kind; }
+  OSLogDate date() const override { return moment; }
+  OSLogTimeZone timeZone() const override { return zone; }
+  std::uint64_t threadIdentifier() const override { return thread; }
+  std::uint64_t activityIdentifier() const override { return activity; }
+  std::int32_t processIdentifier() const override { return pid; }
+  std::string_view process() const override { return texts[0]; }
+  std::string_view sender() const override { return texts[1]; }
+  std::string_view subsystem() const override { return texts[2]; }
+  std::string_view category() const override { return texts[3]; }
+  std::string_view composedMessage() const override { return texts[4]; }
+
+  using Texts = std::array<std::string_view, 5>;
+  Texts& allTexts() { return texts; }
+
+ private:
+  std::uint64_t thread;
+  std::uint64_t activity;
+  OSLogDate moment;
+  OSLogTimeZone zone;
+  std::uint32_t kind;
+  std::int32_t pid;
+  Texts texts;
+};
+
+/// Reads a log and makes out its events on a thread of its own, a little ahead of whoever takes
+/// them: to read and to use a log take about as long, and can be done at the same time.
 ///
-/// Entries go over in batches. What has been read goes over before more is asked of the source, so
+/// Events go over in batches. What has been read goes over before more is asked of the source, so
 /// that no entry waits for one that comes later; and there are three batches in all, so that the
 /// thread is never more than two ahead.
 ///
@@ -22,8 +55,8 @@ namespace host {
 /// seen to it that the source does not block: the destructor waits for the thread.
 class ReadAhead {
  public:
-  /// Whether an entry is to be handed over. It is called on the reading thread.
-  using Wanted = std::function<bool(const LogEntry&)>;
+  /// Whether an event is to be handed over. It is called on the reading thread.
+  using Wanted = std::function<bool(const LogEvent&)>;
 
   /// Throws `std::system_error` when the system has no thread for it. `source` must outlive this.
   ReadAhead(ByteSource& source, Wanted wanted);
@@ -31,27 +64,29 @@ class ReadAhead {
   ReadAhead& operator=(const ReadAhead&) = delete;
   ~ReadAhead();
 
-  /// As `EntryReader::next` and `EntryReader::entry`, for the entries that are wanted.
+  /// Goes on to the next event that is wanted. As `EntryReader::next`: `entry` is the only result
+  /// that another may follow.
   EntryReader::Result next();
-  const LogEntry& entry() const { return current; }
+
+  /// The event of the last `next`, valid until the next call.
+  const OSLogEventProxy& event() const { return taken.events[given - 1]; }
 
  private:
   class Source;
 
   struct Batch {
-    std::vector<LogEntry> entries;  ///< their values lie in `bytes`, which does not grow
+    std::vector<FinishedEvent> events;  ///< their texts lie in `bytes`, which does not grow
     std::vector<char> bytes;
-    EntryReader::Result after = EntryReader::Result::entry;  ///< what follows the entries
+    EntryReader::Result after = EntryReader::Result::entry;  ///< what follows the events
   };
 
   void readLog(ByteSource& source, const Wanted& wanted);
-  void add(const LogEntry& entry);
+  void add(const LogEvent& event);
   void handOver();
   void takeOver();
 
-  LogEntry current;
   Batch taken;            ///< the user's
-  std::size_t given = 0;  ///< entries of it that have been given
+  std::size_t given = 0;  ///< events of it that have been given
   Batch filling;          ///< the reading thread's
   std::mutex mutex;       ///< of what follows
   std::condition_variable changed;

@@ -33,16 +33,14 @@ struct Delivery {
 /// Throws `std::system_error` when the reading cannot be begun.
 unsigned long deliverEvents(const Delivery& delivery) {
   const auto bytes = delivery.source->open(delivery.from, delivery.filter, *delivery.stop);
-  host::ReadAhead reader(*bytes, [&delivery](const host::LogEntry& entry) {
-    const host::LogEvent event(entry);
+  host::ReadAhead reader(*bytes, [&delivery](const host::LogEvent& event) {
     return event.date() >= delivery.from && delivery.filter.passes(event);
   });
-  const host::LogEvent event(reader.entry());
   EntryReader::Result result = EntryReader::Result::stopped;
   while (!delivery.stop->raised()) {
     result = reader.next();
     if (result != EntryReader::Result::entry) break;
-    if (delivery.eventHandler) delivery.eventHandler(event);
+    if (delivery.eventHandler) delivery.eventHandler(reader.event());
   }
   if (delivery.stop->raised()) return host::kStreamInvalidated;
   if (result == EntryReader::Result::damaged) return host::kStreamDamaged;

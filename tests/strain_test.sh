@@ -1,0 +1,102 @@
+#!/usr/bin/env bash
+# The program under strain: a long run, and what no user should do to it.
+# usage: tests/strain_test.sh PROGRAM
+set -euo pipefail
+
+program=$(realpath "$1")
+scratch=$(mktemp -d)
+trap 'rm -rf "$scratch"' EXIT
+cd "$scratch"
+
+fail() {
+  echo "strain_test: $*" >&2
+  exit 1
+}
+
+expect_status() {  # STATUS WHAT COMMAND ...: what it prints is of no interest
+  local expected=$1 what=$2 status=0
+  shift 2
+  timeout 100 "$@" >/dev/null 2>err || status=$?
+  [ "$status" = "$expected" ] || fail "$what: status $status, not $expected: $(head -c 500 err)"
+}
+
+# One round of commands: a group of four lines that the model below knows.
+commands() { for ((i = 0; i < $1; i++)); do printf 'logdump tel r\nlogdump core\nbogus -- help\nlogdump bb tar\n'; done; }
+
+# The memory that the program holds, in KiB, once all that has been typed is done.
+settled_memory() {  # PROCESS FILE-OF-OUTPUT PROMPTS
+  local deadline=$((SECONDS + 100))
+  until [ "$(grep -o '(/zubtool)>> ' "$2" | wc -l)" -ge "$3" ]; do
+    [ $SECONDS -lt $deadline ] || fail "the program does not get on"
+    sleep 0.1
+  done
+  sed -n 's/^VmRSS:[^0-9]*\([0-9]*\).*/\1/p' "/proc/$1/status"
+}
+
+soak() {
+  local rounds=2500 path=/private/var/wireless/Library/Logs/CrashVault/Baseband/log-bb-T early late
+  echo 'dump-timestamp = T' >device
+  mkfifo typed
+  ZUB_DEVICE=device "$program" <typed >out 2>err &
+  local process=$!
+  exec 3>typed
+  commands $((rounds / 5)) >&3
+  early=$(settled_memory $process out $((4 * rounds / 5 + 1)))
+  commands $((rounds - rounds / 5)) >&3
+  late=$(settled_memory $process out $((4 * rounds + 1)))
+  echo quit >&3
+  exec 3>&-
+  wait $process || fail "the long run: status $?"
+  [ "$late" -le $((early + 256)) ] || fail "memory grows from $early to $late KiB"
+  ZUB_DEVICE=device "$program" bogus >help || true
+  {
+    for ((i = 0; i < rounds; i++)); do
+      printf '(/zubtool)>> Telephony log collection: Success\nPath = %s.tar.gz\n' $path
+      printf '(/zubtool)>> Telephony log collection with Coredump: Success\nPath = %s.tar.gz\n' $path
+      printf '(/zubtool)>> '
+      cat help
+      printf '(/zubtool)>> Baseband log collection: Success (ZUB running)\nPath = %s.tar\n' $path
+    done
+    printf '(/zubtool)>> '
+  } >expected
+  cmp out expected >&2 || fail "the long run prints something else"
+  [ ! -s err ] || fail "the long run complains: $(head -n 3 err)"
+}
+
+# The server comes and goes: each command is either done or refused, and neither is lost or doubled.
+soak_with_a_server_that_comes_and_goes() {
+  local rounds=2500 refused failed done_ helped
+  {
+    printf 'dump-timestamp = T\nserver = 0 Started'
+    for ((ms = 500; ms < 10000; ms += 10)); do printf ', %d Off, %d Started' $ms $((ms + 5)); done
+    printf '\n'
+  } >device
+  { commands $rounds; echo quit; } | ZUB_DEVICE=device "$program" >out 2>err || fail "status $?"
+  refused=$(grep -c '^Server is not running. Please try after server starts.$' err || true)
+  failed=$(grep -cE 'Telephony log collection.*: Failed$' out || true)  # gone behind the gate
+  done_=$(grep -cE 'Telephony log collection.*: Success$' out || true)
+  helped=$(grep -cE 'Success \(ZUB (not )?running\)$' out)
+  [ "$(wc -l <err)" = "$refused" ] || fail "other complaints: $(grep -v '^Server' err | head -n 3)"
+  [ $((refused + failed + done_)) = $((2 * rounds)) ] ||
+    fail "$refused refused, $failed failed, $done_ done"
+  [ "$helped" = "$rounds" ] || fail "$helped baseband collections"
+  [ "$(grep -c 'Path = ' out)" = $((done_ + helped)) ] || fail "a path is lost or doubled"
+}
+
+soak
+soak_with_a_server_that_comes_and_goes
+
+expect_status 0 "closed standard output" sh -c '"$0" help >&-' "$program"
+expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$program"
+expect_status 0 "full standard output and error" sh -c '"$0" help >/dev/full 2>&1' "$program"
+expect_status 1 "a line of 100 MB" sh -c 'head -c 100000000 /dev/zero | tr "\0" a | "$0"' "$program"
+expect_status 1 "a line of 100,000 words" sh -c 'yes tel | head -n 100000 | tr "\n" " " | "$0"' "$program"
+expect_status 0 "100,000 groups" "$program" $(yes 'help --' | head -n 50000)
+expect_status 1 "arbitrary bytes" sh -c 'head -c 1000000 "$0" | "$0"' "$program"
+
+# Ctrl-C and a terminal that goes away end it at once, also while a collection is under way.
+echo 'dump-delay = 100000' >device
+for signal in INT HUP; do
+  ZUB_DEVICE=device expect_status $((128 + $(kill -l $signal))) "$signal" \
+    bash -c '(sleep 1; kill -'$signal' $$) & exec "$0" logdump tel' "$program"
+done
