@@ -276,7 +276,9 @@ TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
   EXPECT_EQ(read(reader, text.data(), 4), 4);
   EXPECT_EQ(text, "1970");
   fcntl(reader, F_SETFL, 0);
-  for (char piece[65536]; const auto length = read(reader, piece, sizeof piece);) {
+  char piece[65536];
+  ssize_t length = 0;
+  while ((length = read(reader, piece, sizeof piece)) > 0) {
     text.append(piece, static_cast<std::size_t>(length));
   }
   EXPECT_EQ(std::ranges::count(text, '\n'), 1) << "the line under way, and none behind it";
