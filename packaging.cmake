@@ -2,8 +2,10 @@
 include(GNUInstallDirs)
 
 install(TARGETS zubtool)
-install(DIRECTORY devices/ DESTINATION ${CMAKE_INSTALL_DATADIR}/zubtool/devices)
-install(FILES README.md DESTINATION ${CMAKE_INSTALL_DOCDIR})
+if(platform STREQUAL host)  # device profiles are that platform's
+  install(DIRECTORY devices/ DESTINATION ${CMAKE_INSTALL_DATADIR}/zubtool/devices)
+  set(host_pages zub-device.5)
+endif()
 install(FILES completions/zubtool.bash RENAME zubtool
         DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions)
 install(FILES completions/_zubtool DESTINATION ${CMAKE_INSTALL_DATADIR}/zsh/vendor-completions)
@@ -12,7 +14,7 @@ install(FILES completions/zubtool.fish
 
 # Man pages are compressed, the same bytes each time, where that is possible.
 find_program(GZIP gzip)
-foreach(page zubtool.1 zub-device.5)
+foreach(page zubtool.1 ${host_pages})
   string(REGEX MATCH "[0-9]$" section ${page})
   set(installed ${CMAKE_CURRENT_SOURCE_DIR}/docs/${page})
   if(GZIP)

@@ -1,7 +1,6 @@
 #include "logdump/OsLogCommand.h"
 
 #include <algorithm>
-#include <cerrno>
 #include <cstdlib>
 #include <iostream>
 #include <limits>

@@ -10,8 +10,7 @@
 namespace {
 
 constexpr std::chrono::seconds kTimeout{180};
-constexpr std::uint64_t kStreamFlags = 21;       // the bits are the log store's
-constexpr std::uint32_t kLogMessageType = 1024;  // likewise
+constexpr std::uint64_t kStreamFlags = 21;  // the bits are the log store's
 
 using StreamHandle = std::shared_ptr<OSLogEventStream>;
 
@@ -24,15 +23,14 @@ class LineFile {
   /// Writes `line`, unless the file is closed. False when it could not be written whole; that
   /// closes the file.
   bool append(const std::string& line) {
-    const std::lock_guard lock(mutex);
-    if (!closing && file && !file.write(line)) {
-      failed = true;
-      closing = true;
-      file.close();
-      return false;
+    bool written = true;
+    {
+      const std::lock_guard lock(mutex);
+      if (!closing) written = file.write(line);
+      if (!written) failed = closing = true;
     }
-    if (closing) file.close();
-    return true;
+    if (closing) close();
+    return written;
   }
 
   /// Does not wait for a line that is being written, for a stalled reader may hold it up for good:
@@ -57,7 +55,7 @@ StreamHandle prepareStream() {
     std::mutex mutex;
     StreamHandle stream;
   };
-  // Shared with the handler, since a store that calls it too late finds nobody waiting.
+  // Shared with the handler: one that is called too late after all finds nobody waiting.
   const auto outcome = std::make_shared<Outcome>();
   OSLogEventStore::localStore()->prepareWithCompletionHandler(
       [outcome](const std::shared_ptr<OSLogEventSource>& source,
@@ -119,7 +117,7 @@ void setHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& fi
                  const std::string& path, const dispatch::group& group) {
   const std::weak_ptr<OSLogEventStream> weakStream = stream;  // the stream owns its handlers
   stream->setEventHandler([file, path, weakStream](const OSLogEventProxy& event) {
-    if (event.type() != kLogMessageType || file->append(formatLine(event))) return;
+    if (event.type() != kOSLogEventTypeLogMessage || file->append(formatLine(event))) return;
     platform::logError("Failed to write file: " + path);
     if (const auto failing = weakStream.lock()) failing->invalidate();
   });

@@ -54,13 +54,16 @@ class OSLogTimeZone {
   std::optional<std::int32_t> fixed;
 };
 
+/// The type of an event that is a log message.
+inline constexpr std::uint32_t kOSLogEventTypeLogMessage = 1024;
+
 /// One event of the log. The store owns it and every text that it hands out; both are valid until
 /// the event handler returns. All texts are UTF-8.
 class OSLogEventProxy {
  public:
   virtual ~OSLogEventProxy() = default;
 
-  virtual std::uint32_t type() const = 0;  ///< 1024 for a log message
+  virtual std::uint32_t type() const = 0;
   virtual OSLogDate date() const = 0;
   virtual OSLogTimeZone timeZone() const = 0;  ///< of the device when the event was logged
   virtual std::uint64_t threadIdentifier() const = 0;

@@ -6,7 +6,8 @@
 
 /// The telephony utility library: what device this is, and a few tools of the telephony stack.
 ///
-/// Threads: every function may be called from any thread. None of them fails.
+/// Threads: every function may be called from any thread. None of them fails: what a device does
+/// not know is 0 or false.
 
 /// The product enumeration: what `TelephonyRadiosGetProduct` returns.
 enum class TelephonyProduct : int {

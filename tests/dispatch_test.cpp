@@ -38,6 +38,15 @@ TEST(Group, WaitEndsWithTheLastLeaveOnAnotherThread) {
   }
 }
 
+TEST(Queue, ReleasesATaskWhereTheReleaseMayGiveItAnother) {
+  const auto group = dispatch::group::create();
+  const dispatch::queue queue("release");
+  std::shared_ptr<void> last(
+      nullptr, [queue, member = dispatch::membership(group)](void*) { queue.async([member] {}); });
+  queue.async([moved = std::move(last)] {});
+  EXPECT_TRUE(group.wait(60s));
+}
+
 TEST(Queue, RunsTasksInOrderAndReleasesEachBeforeTheNext) {
   const auto group = dispatch::group::create();
   const auto owned = std::make_shared<int>(0);

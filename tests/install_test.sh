@@ -21,7 +21,7 @@ expected() {
   printf '%s\n' '755 usr/bin/zubtool' "644 $share/man/man1/zubtool.1.gz" \
     "644 $share/man/man5/zub-device.5.gz" "644 $share/bash-completion/completions/zubtool" \
     "644 $share/zsh/vendor-completions/_zubtool" \
-    "644 $share/fish/vendor_completions.d/zubtool.fish" "644 $share/doc/zubtool/README.md"
+    "644 $share/fish/vendor_completions.d/zubtool.fish"
   for file in "$sources"/devices/*; do echo "644 $share/zubtool/devices/${file##*/}"; done
 }
 

@@ -81,8 +81,8 @@ TEST(ZUBCommand, SharesItsConnectionAndGivesItBack) {
   std::weak_ptr<zub::client::Manager> manager;
   {
     const dispatch::queue queue("tree");
-    queue.async([queueThread] {
-      const thread_local dispatch::membership untilTheThreadEnds(queueThread);
+    queue.async([member = dispatch::membership(queueThread)] {
+      const thread_local dispatch::membership untilTheThreadEnds(member);
       static_cast<void>(untilTheThreadEnds);
     });
     const auto own = zub::client::CreateManager("test", queue);

@@ -8,8 +8,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
-#include <iterator>
-#include <mutex>
 
 namespace host {
 namespace {

@@ -39,9 +39,13 @@ class RunningProcesses {
     return *processes;
   }
 
-  void add(pid_t process) {
+  /// Calls `spawn`, which returns an error number and, where that is 0, has set `process`.
+  template <class Spawn>
+  int start(const pid_t& process, Spawn spawn) {
     const std::lock_guard lock(mutex);
-    running.insert(process);
+    const int error = spawn();
+    if (error == 0) running.insert(process);
+    return error;
   }
 
   /// waitpid(2) for one of them, which is none of them any more once it has been reaped: from then
@@ -127,10 +131,14 @@ JournalProcess::JournalProcess(const std::vector<std::string>& arguments) {
   std::vector<char*> words = {const_cast<char*>(name.c_str())};
   for (const std::string& word : arguments) words.push_back(const_cast<char*>(word.c_str()));
   words.push_back(nullptr);
-  check(::posix_spawnp(&process, name.c_str(), &settings.actions, &settings.attributes,
-                       words.data(), plainEnvironment().data()),
+  const auto environment = plainEnvironment();
+  check(RunningProcesses::all().start(process,
+                                      [&] {
+                                        return ::posix_spawnp(
+                                            &process, name.c_str(), &settings.actions,
+                                            &settings.attributes, words.data(), environment.data());
+                                      }),
         "journalctl");
-  RunningProcesses::all().add(process);
   standardOutput = std::move(output.reading);
   standardError = std::move(error.reading);
 }

@@ -13,7 +13,8 @@ namespace host {
 
 /// A journalctl that runs. It is found on the PATH and started without a shell, with nothing on its
 /// standard input, with the signals as a new process expects them, and without the SYSTEMD_
-/// variables of the environment. It does not outlive this process, should that exit first.
+/// variables of the environment. Should this process call exit first, it is killed; should
+/// this process be killed, it ends at its next write.
 ///
 /// Threads: one at a time.
 class JournalProcess {

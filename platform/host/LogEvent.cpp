@@ -8,7 +8,6 @@
 namespace host {
 namespace {
 
-constexpr std::uint32_t kLogMessage = 1024;
 constexpr std::int32_t kSecondsADay = 86'400;
 
 /// The first of `fields` that is a whole decimal number.
@@ -36,7 +35,7 @@ std::string_view firstOf(const LogEntry& entry, Fields... fields) {
 }  // namespace
 
 std::uint32_t LogEvent::type() const {
-  return number<std::uint32_t>(entry, Field::type).value_or(kLogMessage);
+  return number<std::uint32_t>(entry, Field::type).value_or(kOSLogEventTypeLogMessage);
 }
 
 OSLogTimeZone LogEvent::timeZone() const {

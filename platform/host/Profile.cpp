@@ -265,9 +265,7 @@ std::optional<std::string> parseProfile(std::string_view text, const std::string
     if (!wrong.empty())
       return (file + ":").append(std::to_string(number)).append(": ").append(wrong);
   }
-  if (profile.log != "sample" && profile.log != "journal") {
-    profile.log = besideProfile(profile.log, file);
-  }
+  if (profile.hasLogPath()) profile.log = besideProfile(profile.log, file);
   return std::nullopt;
 }
 

@@ -44,7 +44,7 @@ struct Profile {
   Answer basebandEnabled = {.text = "true"};
   Answer basebandHighThroughput = {.text = "false"};
   Answer dump;
-  std::optional<std::string> dumpTimestamp;  ///< none: the time of the request
+  std::optional<std::string> dumpTimestamp;  ///< none: the time of the answer
   std::chrono::milliseconds dumpDelay{0};
 
   bool helperExists = true;
@@ -53,8 +53,9 @@ struct Profile {
 
   std::string requestLog;  ///< path; empty for none
 
-  std::string log = "sample";               ///< "sample", "journal", or a path
-  std::string logPrepareError;              ///< empty when the store can be prepared
+  std::string log = "sample";   ///< "sample", "journal", or a path
+  std::string logPrepareError;  ///< empty when the store can be prepared
+  bool hasLogPath() const { return log != "sample" && log != "journal"; }
   std::optional<unsigned long> logEnd = 5;  ///< the reason a stream ends with; none: it never ends
 };
 

@@ -19,7 +19,7 @@ struct SampleEvent {
   std::string_view message;
 };
 
-constexpr int kLogMessage = 1024;
+constexpr int kLogMessage = kOSLogEventTypeLogMessage;
 constexpr int kStateChange = 768;  // of no interest to who wants messages
 
 constexpr auto kEvents = std::to_array<SampleEvent>({

@@ -18,8 +18,9 @@ namespace {
 bool isTheLog(const std::string& path) {
   struct stat file {};
   struct stat log {};
-  return stat(path.c_str(), &file) == 0 && stat(host::device().log.c_str(), &log) == 0 &&
-         file.st_dev == log.st_dev && file.st_ino == log.st_ino;
+  return host::device().hasLogPath() && stat(path.c_str(), &file) == 0 &&
+         stat(host::device().log.c_str(), &log) == 0 && file.st_dev == log.st_dev &&
+         file.st_ino == log.st_ino;
 }
 
 }  // namespace

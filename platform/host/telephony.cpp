@@ -1,7 +1,5 @@
 #include "platform/telephony.h"
 
-#include <unistd.h>
-
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
@@ -29,9 +27,7 @@ bool runsOnThisMachine(const std::string& name) {
     std::string comm;
     if (!std::getline(std::ifstream(entry->path() / "comm"), comm)) continue;
     std::error_code hidden;  // the program file of another user's process
-    auto program = fs::read_symlink(entry->path() / "exe", hidden).string();
-    constexpr std::string_view kReplaced = " (deleted)";  // by an upgrade, while it runs
-    if (program.ends_with(kReplaced)) program.resize(program.size() - kReplaced.size());
+    const auto program = fs::read_symlink(entry->path() / "exe", hidden).string();
     if (host::processName(comm, program) == name) return true;
   }
   return false;
