@@ -12,7 +12,7 @@
 
 #include "bench/Ratio.h"
 #include "oslog/OsLogStream.h"
-#include "platform/host/Device.h"
+#include "platform/host/device/Device.h"
 
 namespace {
 

@@ -7,10 +7,10 @@
 #include <string>
 #include <string_view>
 
-#include "platform/host/EntryReader.h"
-#include "platform/host/EventFilter.h"
-#include "platform/host/LogEvent.h"
-#include "platform/host/Utf8.h"
+#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/EventFilter.h"
+#include "platform/host/log/LogEvent.h"
+#include "platform/posix/Utf8.h"
 
 namespace {
 

@@ -97,7 +97,7 @@ check_words() {
 # Prints those of the texts in the parser's source that it takes for a key.
 keys_of_profile() {
   local profile=$scratch/device text message status
-  find_all '"[^"]*"' <"$sources/platform/host/Profile.cpp" | sed 's/^"//; s/"$//; /^$/d' |
+  find_all '"[^"]*"' <"$sources/platform/host/device/Profile.cpp" | sed 's/^"//; s/"$//; /^$/d' |
     sort -u >"$scratch/texts"
   while IFS= read -r text; do
     printf '%s =\n=\n' "$text" >"$profile"  # the second line is wrong whatever the first is

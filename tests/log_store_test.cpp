@@ -12,16 +12,16 @@
 #include <stdexcept>
 #include <thread>
 
-#include "platform/host/Device.h"
-#include "platform/host/EntryReader.h"
-#include "platform/host/EventFilter.h"
-#include "platform/host/FoldedText.h"
-#include "platform/host/LogEvent.h"
-#include "platform/host/LogSource.h"
 #include "platform/host/ProcessName.h"
-#include "platform/host/StreamEnd.h"
-#include "platform/host/Utf8.h"
+#include "platform/host/device/Device.h"
+#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/EventFilter.h"
+#include "platform/host/log/FoldedText.h"
+#include "platform/host/log/LogEvent.h"
+#include "platform/host/log/LogSource.h"
+#include "platform/host/log/StreamEnd.h"
 #include "platform/oslog_store.h"
+#include "platform/posix/Utf8.h"
 #include "tests/Program.h"
 #include "tests/Table.h"
 

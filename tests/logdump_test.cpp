@@ -6,7 +6,7 @@
 #include "logdump/LogdumpOptions.h"
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
-#include "platform/host/Device.h"
+#include "platform/host/device/Device.h"
 #include "tests/Table.h"
 #include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"

@@ -1,4 +1,4 @@
-#include "platform/host/Profile.h"
+#include "platform/host/device/Profile.h"
 
 #include <gtest/gtest.h>
 

@@ -7,7 +7,7 @@
 
 #include <cerrno>
 
-#include "platform/host/Device.h"
+#include "platform/host/device/Device.h"
 
 const char* getprogname() { return program_invocation_short_name; }
 

@@ -1,4 +1,4 @@
-#include "platform/host/StopSignal.h"
+#include "platform/host/log/StopSignal.h"
 
 #include <poll.h>
 #include <sys/eventfd.h>

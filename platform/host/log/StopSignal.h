@@ -2,7 +2,7 @@
 
 #include <atomic>
 
-#include "platform/host/Descriptor.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 

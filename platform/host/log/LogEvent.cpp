@@ -1,9 +1,9 @@
-#include "platform/host/LogEvent.h"
+#include "platform/host/log/LogEvent.h"
 
 #include <charconv>
 
 #include "platform/host/ProcessName.h"
-#include "platform/host/Utf8.h"
+#include "platform/posix/Utf8.h"
 
 namespace host {
 namespace {

@@ -1,4 +1,4 @@
-#include "platform/host/EventFilter.h"
+#include "platform/host/log/EventFilter.h"
 
 #include <algorithm>
 #include <stdexcept>

@@ -4,9 +4,9 @@
 #include <memory>
 #include <string>
 
-#include "platform/host/ByteSource.h"
-#include "platform/host/EventFilter.h"
-#include "platform/host/StopSignal.h"
+#include "platform/host/log/ByteSource.h"
+#include "platform/host/log/EventFilter.h"
+#include "platform/host/log/StopSignal.h"
 #include "platform/oslog_store.h"
 
 namespace host {

@@ -1,4 +1,4 @@
-#include "platform/host/ReadAhead.h"
+#include "platform/host/log/ReadAhead.h"
 
 #include <algorithm>
 #include <utility>

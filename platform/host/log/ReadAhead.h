@@ -7,9 +7,9 @@
 #include <thread>
 #include <vector>
 
-#include "platform/host/ByteSource.h"
-#include "platform/host/EntryReader.h"
-#include "platform/host/LogEvent.h"
+#include "platform/host/log/ByteSource.h"
+#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/LogEvent.h"
 
 namespace host {
 

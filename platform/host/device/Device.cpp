@@ -1,4 +1,4 @@
-#include "platform/host/Device.h"
+#include "platform/host/device/Device.h"
 
 #include <fcntl.h>
 #include <unistd.h>

@@ -1,4 +1,4 @@
-#include "platform/host/SampleLog.h"
+#include "platform/host/log/SampleLog.h"
 
 #include <array>
 #include <string_view>

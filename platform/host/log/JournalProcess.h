@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/host/Descriptor.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 

@@ -1,9 +1,9 @@
-#include "platform/host/FoldedText.h"
+#include "platform/host/log/FoldedText.h"
 
 #include <algorithm>
 #include <array>
 
-#include "platform/host/Utf8.h"
+#include "platform/posix/Utf8.h"
 
 namespace host {
 namespace {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "platform/host/EventFilter.h"
+#include "platform/host/log/EventFilter.h"
 #include "platform/oslog_store.h"
 
 /// What there is to know of a journal before and when journalctl reads it. `folder` names the

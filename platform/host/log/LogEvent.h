@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include "platform/host/EntryReader.h"
+#include "platform/host/log/EntryReader.h"
 #include "platform/oslog_store.h"
 
 namespace host {

@@ -1,11 +1,11 @@
-#include "platform/host/Profile.h"
+#include "platform/host/device/Profile.h"
 
 #include <algorithm>
 #include <charconv>
 #include <limits>
 #include <map>
 
-#include "platform/host/Utf8.h"
+#include "platform/posix/Utf8.h"
 
 namespace host {
 namespace {

@@ -1,7 +1,7 @@
 #include "platform/zub_helper.h"
 
-#include "platform/host/Device.h"
-#include "platform/host/Requests.h"
+#include "platform/host/device/Device.h"
+#include "platform/host/device/Requests.h"
 
 namespace zub {
 namespace helper {

@@ -7,7 +7,7 @@
 #include <string_view>
 #include <vector>
 
-#include "platform/host/ByteSource.h"
+#include "platform/host/log/ByteSource.h"
 
 namespace host {
 

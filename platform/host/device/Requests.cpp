@@ -1,4 +1,4 @@
-#include "platform/host/Requests.h"
+#include "platform/host/device/Requests.h"
 
 #include <array>
 #include <chrono>

@@ -4,8 +4,8 @@
 #include <string>
 #include <vector>
 
-#include "platform/host/FoldedText.h"
-#include "platform/host/LogEvent.h"
+#include "platform/host/log/FoldedText.h"
+#include "platform/host/log/LogEvent.h"
 #include "platform/oslog_store.h"
 
 namespace host {

@@ -1,4 +1,4 @@
-#include "platform/host/EntryReader.h"
+#include "platform/host/log/EntryReader.h"
 
 #include <bit>
 #include <charconv>

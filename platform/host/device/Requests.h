@@ -3,7 +3,7 @@
 #include <optional>
 #include <string>
 
-#include "platform/host/Profile.h"
+#include "platform/host/device/Profile.h"
 #include "platform/lumo.h"
 #include "platform/zub_client.h"
 

@@ -5,14 +5,14 @@
 #include <thread>
 #include <utility>
 
-#include "platform/host/Device.h"
-#include "platform/host/EntryReader.h"
-#include "platform/host/EventFilter.h"
-#include "platform/host/LogEvent.h"
-#include "platform/host/LogSource.h"
-#include "platform/host/ReadAhead.h"
-#include "platform/host/StopSignal.h"
-#include "platform/host/StreamEnd.h"
+#include "platform/host/device/Device.h"
+#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/EventFilter.h"
+#include "platform/host/log/LogEvent.h"
+#include "platform/host/log/LogSource.h"
+#include "platform/host/log/ReadAhead.h"
+#include "platform/host/log/StopSignal.h"
+#include "platform/host/log/StreamEnd.h"
 
 namespace {
 

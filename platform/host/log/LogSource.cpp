@@ -1,4 +1,4 @@
-#include "platform/host/LogSource.h"
+#include "platform/host/log/LogSource.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -9,10 +9,10 @@
 #include <system_error>
 #include <vector>
 
-#include "platform/host/Descriptor.h"
-#include "platform/host/Journal.h"
-#include "platform/host/JournalProcess.h"
-#include "platform/host/SampleLog.h"
+#include "platform/host/log/Journal.h"
+#include "platform/host/log/JournalProcess.h"
+#include "platform/host/log/SampleLog.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 namespace {

@@ -4,8 +4,8 @@
 #include <filesystem>
 #include <fstream>
 
-#include "platform/host/Device.h"
 #include "platform/host/ProcessName.h"
+#include "platform/host/device/Device.h"
 
 int TelephonyRadiosGetRadio() { return host::device().radio; }
 int TelephonyRadiosGetProduct() { return host::device().product; }

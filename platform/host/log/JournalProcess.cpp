@@ -1,4 +1,4 @@
-#include "platform/host/JournalProcess.h"
+#include "platform/host/log/JournalProcess.h"
 
 #include <fcntl.h>
 #include <spawn.h>

@@ -1,4 +1,4 @@
-#include "platform/host/Utf8.h"
+#include "platform/posix/Utf8.h"
 
 #include <array>
 #include <cstdint>

@@ -1,4 +1,4 @@
-#include "platform/host/Journal.h"
+#include "platform/host/log/Journal.h"
 
 #include <fcntl.h>
 
@@ -11,9 +11,9 @@
 #include <string_view>
 #include <system_error>
 
-#include "platform/host/Descriptor.h"
-#include "platform/host/JournalProcess.h"
 #include "platform/host/ProcessName.h"
+#include "platform/host/log/JournalProcess.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "platform/host/Profile.h"
+#include "platform/host/device/Profile.h"
 
 /// The device that this library stands in for. There is one in a process.
 namespace host {

@@ -5,8 +5,8 @@
 #include <thread>
 #include <vector>
 
-#include "platform/host/Device.h"
-#include "platform/host/Requests.h"
+#include "platform/host/device/Device.h"
+#include "platform/host/device/Requests.h"
 
 namespace zub {
 
