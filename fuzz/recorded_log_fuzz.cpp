@@ -36,7 +36,7 @@ void require(bool holds) {
 }
 
 void add(std::string& told, std::string_view text) {
-  require(host::isUtf8(text));
+  require(posix::isUtf8(text));
   told.append(text).append("|");
 }
 

@@ -18,7 +18,7 @@ using StreamHandle = std::shared_ptr<OSLogEventStream>;
 /// is over: a closed file takes none.
 class LineFile {
  public:
-  explicit LineFile(platform::FileHandle opened) : file(std::move(opened)) {}
+  explicit LineFile(std::unique_ptr<platform::FileHandle> opened) : file(std::move(opened)) {}
 
   /// Writes `line`, unless the file is closed. False when it could not be written whole; that
   /// closes the file.
@@ -26,7 +26,7 @@ class LineFile {
     bool written = true;
     {
       const std::lock_guard lock(mutex);
-      if (!closing) written = file.write(line);
+      if (!closing) written = file->write(line);
       if (!written) failed = closing = true;
     }
     if (closing) close();
@@ -37,14 +37,14 @@ class LineFile {
   /// the file then closes behind that line.
   void close() {
     closing = true;
-    if (const std::unique_lock lock(mutex, std::try_to_lock); lock) file.close();
+    if (const std::unique_lock lock(mutex, std::try_to_lock); lock) file.reset();
   }
 
   bool hasFailed() const { return failed; }
 
  private:
   std::mutex mutex;
-  platform::FileHandle file;
+  std::unique_ptr<platform::FileHandle> file;
   std::atomic<bool> closing = false;
   std::atomic<bool> failed = false;
 };

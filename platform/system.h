@@ -1,8 +1,8 @@
 #pragma once
 
+#include <memory>
 #include <string>
 #include <string_view>
-#include <utility>
 
 /// The name under which the program was invoked, without its folder. Owned by the C library, as
 /// in getprogname(3) of the BSDs. Any thread.
@@ -14,39 +14,33 @@ namespace platform {
 /// callbacks. In practice it does not return.
 void runMainEventLoop();
 
+/// Makes the standard streams safe to use, before anything else is opened and while there is one
+/// thread: each that is closed becomes the null device, and a reader that goes away, or a limit to
+/// a file's size, costs the output and not the process.
+void openStandardStreams();
+
 /// Sees to it that there is an empty file at `path`: makes one, or empties the one that is there.
-/// What is no regular file (a device, a pipe) is left as it is. A failure is not told: what counts
-/// is whether the file can be opened then. Any thread.
+/// What is no regular file (a device, a pipe) is left as it is. A failure is not reported: what
+/// counts is whether the file can be opened then. Any thread.
 void createEmptyFile(const std::string& path);
 
-/// A file open for writing at its end. Move-only; closes when destroyed.
+/// A file open for writing at its end; it closes when destroyed.
 ///
 /// Threads: one at a time.
 class FileHandle {
  public:
-  /// Opens the existing file at `path`. The handle is empty when that is not possible, which
-  /// includes a pipe that nobody reads, and the recorded log that the device itself reads.
-  static FileHandle openForAppending(const std::string& path);
+  /// Opens the existing file at `path`. Null when that is not possible, which includes a pipe that
+  /// nobody reads, and what the device itself reads.
+  static std::unique_ptr<FileHandle> openForAppending(const std::string& path);
 
-  FileHandle(FileHandle&& other) noexcept : descriptor(std::exchange(other.descriptor, -1)) {}
-  FileHandle& operator=(FileHandle&& other) noexcept {
-    std::swap(descriptor, other.descriptor);
-    return *this;
-  }
-  ~FileHandle() { close(); }
-
-  explicit operator bool() const noexcept { return descriptor >= 0; }
+  FileHandle() = default;
+  FileHandle(const FileHandle&) = delete;
+  FileHandle& operator=(const FileHandle&) = delete;
+  virtual ~FileHandle() = default;
 
   /// Appends `bytes` in one system call, with nothing buffered. False when not all of them could
-  /// be written; how many were is not told.
-  bool write(std::string_view bytes);
-
-  /// Closes the file. Nothing happens when it is closed already.
-  void close() noexcept;
-
- private:
-  explicit FileHandle(int opened) : descriptor(opened) {}
-  int descriptor = -1;
+  /// be written; how many were is not known.
+  [[nodiscard]] virtual bool write(std::string_view bytes) = 0;
 };
 
 /// Writes `message` to the system log's default log object at error level. Never to the terminal.

@@ -152,8 +152,8 @@ TEST(RecordedLog, LongFieldsAreWholeUpToTheCap) {
 TEST(Text, Utf8IsRepairedByMaximalSubparts) {
   for (const auto& row : readTable("utf8", 2)) {
     std::string storage;
-    EXPECT_EQ(host::asUtf8(row[0], storage), row[1]);
-    EXPECT_EQ(host::isUtf8(row[0]), row[0] == row[1]) << row[1];
+    EXPECT_EQ(posix::asUtf8(row[0], storage), row[1]);
+    EXPECT_EQ(posix::isUtf8(row[0]), row[0] == row[1]) << row[1];
   }
 }
 

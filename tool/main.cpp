@@ -1,8 +1,5 @@
-#include <fcntl.h>
 #include <pthread.h>
-#include <unistd.h>
 
-#include <csignal>
 #include <cstdlib>
 #include <cstring>
 #include <iostream>
@@ -15,14 +12,6 @@ namespace {
 
 constexpr int kCannotStart = -1;  // status 255
 
-/// Puts the null device in the place of each standard stream that is closed, before anything else
-/// is opened and taken for it.
-void openStandardStreams() {
-  for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream) {
-    if (fcntl(stream, F_GETFD) < 0) open("/dev/null", O_RDWR);
-  }
-}
-
 /// The shell thread. `words` is the command line's word list, which outlives the thread.
 extern "C" void* runShellThread(void* words) {
   const auto commandLine = *static_cast<const std::list<std::string>*>(words);
@@ -34,11 +23,7 @@ extern "C" void* runShellThread(void* words) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  openStandardStreams();
-  // A reader that goes away, or a limit to a file's size, costs the output, not the collection or
-  // the exit status.
-  signal(SIGPIPE, SIG_IGN);
-  signal(SIGXFSZ, SIG_IGN);
+  platform::openStandardStreams();
   auto words = CommandShell::convertCmdArgsToList(argc, argv);
   if (const char* const why = whyNotToStart()) {
     std::cout << why << std::endl;

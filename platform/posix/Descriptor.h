@@ -4,7 +4,7 @@
 
 #include <utility>
 
-namespace host {
+namespace posix {
 
 /// Owns an open file descriptor, or none (-1), and closes it.
 class Descriptor {
@@ -26,4 +26,4 @@ class Descriptor {
   int number;
 };
 
-}  // namespace host
+}  // namespace posix

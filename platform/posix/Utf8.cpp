@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <cstring>
 
-namespace host {
+namespace posix {
 namespace {
 
 constexpr char32_t kReplacement = 0xFFFD;
@@ -117,4 +117,4 @@ void appendUtf8(std::string& text, char32_t codePoint) {
   }
 }
 
-}  // namespace host
+}  // namespace posix

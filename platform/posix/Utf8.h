@@ -5,7 +5,7 @@
 
 /// UTF-8 as the Unicode standard defines it: no overlong forms, no surrogates, nothing beyond
 /// U+10FFFF. Every function takes any bytes. Threads: any.
-namespace host {
+namespace posix {
 
 /// True when all of `text` is well-formed. Runs of ASCII cost next to nothing.
 bool isUtf8(std::string_view text);
@@ -22,4 +22,4 @@ char32_t takeCodePoint(std::string_view& text);
 /// Appends `codePoint`, which must be one that UTF-8 can express.
 void appendUtf8(std::string& text, char32_t codePoint);
 
-}  // namespace host
+}  // namespace posix

@@ -238,7 +238,7 @@ std::string quoted(std::string_view text) { return std::string("'").append(text)
 /// Reads one line into `profile`. Returns what is wrong, or an empty text.
 std::string readLine(std::string_view line, Profile& profile,
                      std::map<std::string_view, int>& firstLines, int number) {
-  if (!isUtf8(line)) return "not UTF-8 text";
+  if (!posix::isUtf8(line)) return "not UTF-8 text";
   line = trimmed(line.substr(0, line.find('#')));
   if (line.empty()) return {};
   const auto equals = line.find('=');

@@ -78,8 +78,8 @@ char32_t baseLetter(char32_t code) {
 std::string fold(std::string_view text) {
   std::string folded;
   while (!text.empty()) {
-    const char32_t code = takeCodePoint(text);
-    if (code < kFirstMark || code > kLastMark) appendUtf8(folded, baseLetter(code));
+    const char32_t code = posix::takeCodePoint(text);
+    if (code < kFirstMark || code > kLastMark) posix::appendUtf8(folded, baseLetter(code));
   }
   return folded;
 }

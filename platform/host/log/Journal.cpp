@@ -57,7 +57,8 @@ std::size_t countReadable(const std::vector<fs::path>& paths) {
   std::size_t count = 0;
   for (const fs::path& path : paths) {
     if (!isJournalFile(path)) continue;
-    const Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+    const posix::Descriptor file(
+        ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
     if (file) {
       ++count;
     } else if (errno != ENOENT) {

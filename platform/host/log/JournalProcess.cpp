@@ -82,17 +82,17 @@ struct Pipe {
   Pipe() {
     std::array<int, 2> ends{};
     check(::pipe2(ends.data(), O_CLOEXEC) == 0 ? 0 : errno, "pipe");
-    reading = Descriptor(ends[0]);
-    writing = Descriptor(ends[1]);
+    reading = posix::Descriptor(ends[0]);
+    writing = posix::Descriptor(ends[1]);
   }
-  Descriptor reading;
-  Descriptor writing;
+  posix::Descriptor reading;
+  posix::Descriptor writing;
 };
 
 /// What the new process is given, for the duration of its start.
 class SpawnSettings {
  public:
-  SpawnSettings(const Descriptor& output, const Descriptor& error) {
+  SpawnSettings(const posix::Descriptor& output, const posix::Descriptor& error) {
     check(::posix_spawn_file_actions_init(&actions), "posix_spawn");
     check(::posix_spawnattr_init(&attributes), "posix_spawn");
     sigset_t signals;

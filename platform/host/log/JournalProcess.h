@@ -41,8 +41,8 @@ class JournalProcess {
  private:
   pid_t process = -1;
   std::optional<bool> success;  ///< once it has been reaped
-  Descriptor standardOutput;
-  Descriptor standardError;
+  posix::Descriptor standardOutput;
+  posix::Descriptor standardError;
 };
 
 }  // namespace host

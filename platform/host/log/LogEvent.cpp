@@ -88,7 +88,7 @@ std::string_view LogEvent::pathBytes() const {
 }
 
 std::string_view LogEvent::utf8(Text which, std::string_view bytes) const {
-  return asUtf8(bytes, repaired[static_cast<std::size_t>(which)]);
+  return posix::asUtf8(bytes, repaired[static_cast<std::size_t>(which)]);
 }
 
 }  // namespace host

@@ -9,10 +9,12 @@
 #include <system_error>
 #include <vector>
 
+#include "platform/host/device/Device.h"
 #include "platform/host/log/Journal.h"
 #include "platform/host/log/JournalProcess.h"
 #include "platform/host/log/SampleLog.h"
 #include "platform/posix/Descriptor.h"
+#include "platform/posix/files.h"
 
 namespace host {
 namespace {
@@ -92,7 +94,7 @@ class SampleSource final : public LogSource {
 
 class RecordedSource final : public LogSource {
  public:
-  explicit RecordedSource(Descriptor opened) : descriptor(std::move(opened)) {}
+  explicit RecordedSource(posix::Descriptor opened) : descriptor(std::move(opened)) {}
 
   std::unique_ptr<ByteSource> open(OSLogDate, const EventFilter&,
                                    const StopSignal& stop) const override {
@@ -100,7 +102,7 @@ class RecordedSource final : public LogSource {
   }
 
  private:
-  Descriptor descriptor;
+  posix::Descriptor descriptor;
 };
 
 class JournalSource final : public LogSource {
@@ -130,7 +132,7 @@ std::shared_ptr<LogSource> prepareLog(const std::string& log, std::chrono::milli
   if (log == "sample") return std::make_shared<SampleSource>();
   if (log == "journal") return prepareJournal("", patience);
   // Not to wait here for a pipe's writer: that is for the reading, which can be stopped.
-  Descriptor opened(::open(log.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+  posix::Descriptor opened(::open(log.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
   struct stat about {};
   if (!opened || ::fstat(opened.get(), &about) != 0) {
     throw std::runtime_error(log + ": " + reason(errno));
@@ -140,3 +142,12 @@ std::shared_ptr<LogSource> prepareLog(const std::string& log, std::chrono::milli
 }
 
 }  // namespace host
+
+bool posix::isReadByDevice(const std::string& path) {
+  const host::Profile& device = host::device();
+  struct stat file {};
+  struct stat log {};
+  return device.hasLogPath() && stat(path.c_str(), &file) == 0 &&
+         stat(device.log.c_str(), &log) == 0 && file.st_dev == log.st_dev &&
+         file.st_ino == log.st_ino;
+}

@@ -21,7 +21,7 @@ class StopSignal {
   bool waitReadable(int descriptor) const;
 
  private:
-  Descriptor event;
+  posix::Descriptor event;
   std::atomic<bool> isRaised = false;
 };
 
