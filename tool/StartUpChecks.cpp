@@ -1,7 +1,7 @@
 #include "tool/StartUpChecks.h"
 
 #include "platform/telephony.h"
-#include "tool/Hardware.h"
+#include "tool/Watch.h"
 
 namespace {
 

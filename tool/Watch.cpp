@@ -1,4 +1,4 @@
-#include "tool/Hardware.h"
+#include "tool/Watch.h"
 
 #include "platform/telephony.h"
 
