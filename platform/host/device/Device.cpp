@@ -1,8 +1,5 @@
 #include "platform/host/device/Device.h"
 
-#include <fcntl.h>
-#include <unistd.h>
-
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
@@ -45,19 +42,6 @@ Profile* loadProfile() {
 Profile& device() {
   static auto* const profile = loadProfile();  // never destroyed: other threads outlive exit
   return *profile;
-}
-
-void recordRequest(const std::string& line) {
-  const auto& path = device().requestLog;
-  if (path.empty()) return;
-  const int log = open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
-  const std::string whole = line + '\n';
-  errno = ENOSPC;  // what a write that is cut short says nothing of
-  // One write each, so that lines of several processes never mix.
-  if (log < 0 || write(log, whole.data(), whole.size()) != static_cast<ssize_t>(whole.size())) {
-    std::fprintf(stderr, "%s: cannot write the request log: %s\n", path.c_str(), strerror(errno));
-  }
-  if (log >= 0) close(log);
 }
 
 }  // namespace host

@@ -12,8 +12,4 @@ namespace host {
 /// process with status 255. Threads: any. A test may change the profile while nothing else runs.
 Profile& device();
 
-/// Appends `line` to the device's request log, if it keeps one. When that fails it says why on
-/// standard error, and the device goes on. Threads: any.
-void recordRequest(const std::string& line);
-
 }  // namespace host

@@ -5,8 +5,9 @@
 #include <thread>
 #include <vector>
 
+#include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/device/Requests.h"
+#include "platform/host/device/RequestLog.h"
 
 namespace zub {
 

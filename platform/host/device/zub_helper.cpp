@@ -1,7 +1,8 @@
 #include "platform/zub_helper.h"
 
+#include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/device/Requests.h"
+#include "platform/host/device/RequestLog.h"
 
 namespace zub {
 namespace helper {

@@ -7,12 +7,8 @@
 #include "platform/lumo.h"
 #include "platform/zub_client.h"
 
-/// What the simulated server and the simulated helper service have in common.
+/// How the simulated server and the simulated helper service answer.
 namespace host {
-
-/// A request's dictionary as the request log shows it: {Key="text", Other=1}, with \", \\ and \n in
-/// texts.
-std::string describe(const lumo::dict& request);
 
 /// Answers a request as the profile says: `answer`'s fault if it is one, else success with
 /// {`key`=`value`} in `*reply`. An error leaves `*reply` as it was.

@@ -1,4 +1,4 @@
-#include "platform/host/device/Requests.h"
+#include "platform/host/device/Answers.h"
 
 #include <array>
 #include <chrono>
@@ -6,35 +6,6 @@
 #include <ctime>
 
 namespace host {
-namespace {
-
-/// `text` in quotes, on one line, and with no way to look like what stands around it.
-std::string quoted(const std::string& text) {
-  std::string line = "\"";
-  for (const char byte : text) {
-    if (byte == '"' || byte == '\\' || byte == '\n') line += '\\';
-    line += byte == '\n' ? 'n' : byte;
-  }
-  return line + '"';
-}
-
-std::string describe(const lumo::object& value) {
-  if (const auto* const text = value.as<std::string>()) return quoted(*text);
-  if (const auto* const flag = value.as<bool>()) return *flag ? "true" : "false";
-  if (const auto* const number = value.as<std::int64_t>()) return std::to_string(*number);
-  if (const auto* const entries = value.as<lumo::dict>()) return describe(*entries);
-  return "null";
-}
-
-}  // namespace
-
-std::string describe(const lumo::dict& request) {
-  std::string text;
-  for (const auto& [key, value] : request.entries()) {
-    text += (text.empty() ? "" : ", ") + key + "=" + describe(value);
-  }
-  return "{" + text + "}";
-}
 
 TelephonyLumo::Result answerWith(const Answer& answer, std::string_view key, std::string value,
                                  lumo::object* reply) {

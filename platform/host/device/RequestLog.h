@@ -1,0 +1,18 @@
+#pragma once
+
+#include <string>
+
+#include "platform/lumo.h"
+
+/// The file in which the device records what is asked of it. Threads: any.
+namespace host {
+
+/// A request's dictionary as the request log shows it: {Key="text", Other=1}, with \", \\ and \n in
+/// texts.
+std::string describe(const lumo::dict& request);
+
+/// Appends `line` to the device's request log, if it keeps one. When that fails it says why on
+/// standard error, and the device goes on. Threads: any.
+void recordRequest(const std::string& line);
+
+}  // namespace host
