@@ -9,32 +9,32 @@ void CommandBase::init() {
 
 bool CommandBase::isAllowed(std::string /*name*/) { return true; }
 
-void CommandBase::addCommandHandler(const std::string& handlerName, CommandHandler handler,
+void CommandBase::addCommandHandler(const std::string& name, CommandHandler handler,
                                     const std::string& helpText) {
   if (!handler) return;
-  commandHandlers[handlerName] = std::move(handler);
-  if (!helpText.empty()) commandHelp[handlerName] = helpText;
+  commandHandlers[name] = std::move(handler);
+  if (!helpText.empty()) commandHelp[name] = helpText;
 }
 
-void CommandBase::addSubCommand(const std::string& childName, std::shared_ptr<CommandBase> child) {
-  subCommands[childName] = std::move(child);
+void CommandBase::addSubCommand(const std::string& name, std::shared_ptr<CommandBase> child) {
+  subCommands[name] = std::move(child);
 }
 
-bool CommandBase::isValidCommand(const std::string& word) const {
-  return commandHandlers.contains(word);
+bool CommandBase::isValidCommand(const std::string& name) const {
+  return commandHandlers.contains(name);
 }
 
-bool CommandBase::isValidSubCommand(const std::string& word) const {
-  return subCommands.contains(word);
+bool CommandBase::isValidSubCommand(const std::string& name) const {
+  return subCommands.contains(name);
 }
 
-std::shared_ptr<CommandBase> CommandBase::getSubCommandObj(const std::string& word) const {
-  const auto found = subCommands.find(word);
+std::shared_ptr<CommandBase> CommandBase::getSubCommandObj(const std::string& name) const {
+  const auto found = subCommands.find(name);
   return found != subCommands.end() ? found->second : nullptr;
 }
 
-bool CommandBase::execCommand(const std::string& word, const std::list<std::string>& words) const {
-  const auto found = commandHandlers.find(word);
+bool CommandBase::execCommand(const std::string& name, const std::list<std::string>& words) const {
+  const auto found = commandHandlers.find(name);
   if (found == commandHandlers.end()) return false;
   const auto group = dispatch::group::create();
   if (!group) return false;  // work on no group could not be waited for

@@ -68,8 +68,8 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   std::weak_ptr<CommandBase> getParent() const { return parent; }
 
  protected:
-  CommandBase(std::string commandName, std::weak_ptr<CommandBase> parentCommand)
-      : parent(std::move(parentCommand)), name(std::move(commandName)) {}
+  CommandBase(std::string name, std::weak_ptr<CommandBase> parent)
+      : parent(std::move(parent)), name(std::move(name)) {}
 
   /// Adds this node's handlers and sub-commands, with `addCommandHandler` and `addSubCommand`.
   virtual void registerCommands() = 0;

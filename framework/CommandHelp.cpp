@@ -11,12 +11,12 @@ constexpr auto kGreen = "\033[32m";
 constexpr auto kDefaultColour = "\033[39m";
 
 /// Starts a line of the listing: a tab and `word`, right-justified.
-std::ostream& startLine(const std::string& word) {
+std::ostream& StartLine(const std::string& word) {
   return std::cout << '\t' << std::setw(kNameWidth) << word;
 }
 
 /// The names of a node's handlers, as "[bb|core]".
-std::string summarize(const std::map<std::string, CommandHandler>& handlers) {
+std::string Summarize(const std::map<std::string, CommandHandler>& handlers) {
   std::string summary = "[";
   for (const auto& [name, handler] : handlers) summary += name + "|";
   summary.back() = ']';
@@ -33,7 +33,7 @@ void CommandBase::displayHelp() {
   std::cout << std::endl;
   for (const auto& [handler, callable] : commandHandlers) {
     const auto help = commandHelp.find(handler);
-    startLine(handler) << kSeparator << (help != commandHelp.end() ? help->second : "...")
+    StartLine(handler) << kSeparator << (help != commandHelp.end() ? help->second : "...")
                        << std::endl;
     std::cout << std::endl;
   }
@@ -41,20 +41,20 @@ void CommandBase::displayHelp() {
     printCommandTree(child, 0);
     std::cout << std::endl;
   }
-  startLine("cd") << kSeparator << "<sub-command>" << std::endl;
-  for (const auto* const word : {"help", "back", "quit"}) startLine(word) << std::endl;
+  StartLine("cd") << kSeparator << "<sub-command>" << std::endl;
+  for (const auto* const word : {"help", "back", "quit"}) StartLine(word) << std::endl;
   std::cout << std::endl;
 }
 
 void CommandBase::printCommandTree(const std::shared_ptr<CommandBase>& node, int depth) {
   if (!node->commandHandlers.empty()) {
     if (depth == 0) {
-      startLine(node->name);
+      StartLine(node->name);
     } else {
       std::cout << '\t' << std::string(static_cast<std::size_t>(depth) * kNameWidth, ' ')
                 << "     <" << node->name << '>';
     }
-    std::cout << kSeparator << summarize(node->commandHandlers) << std::endl;
+    std::cout << kSeparator << Summarize(node->commandHandlers) << std::endl;
   }
   for (const auto& [word, child] : node->subCommands) printCommandTree(child, depth + 1);
 }

@@ -47,7 +47,7 @@ CommandShell::Outcome CommandShell::runBatch(const std::list<std::string>& words
 CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
   const bool isOneWord = words.size() == 1;
   for (;;) {
-    const auto word = takeNextWord(words);
+    const auto word = TakeNextWord(words);
     if (word == "cd") return changeDirectory(words);
     if (currentCommand->isValidCommand(word)) {
       return outcomeOf(currentCommand->isAllowed(word) && currentCommand->execCommand(word, words));

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-std::string takeNextWord(std::list<std::string>& words) {
+std::string TakeNextWord(std::list<std::string>& words) {
   std::string word = std::move(words.back());
   words.pop_back();
   return word;

@@ -13,7 +13,7 @@
 /// Pure functions: no state, no errors, any thread.
 
 /// Takes the next word in typing order off `words`, which must not be empty.
-std::string takeNextWord(std::list<std::string>& words);
+std::string TakeNextWord(std::list<std::string>& words);
 
 /// The words of a typed line: its runs of characters that are not white space in the "C" locale.
 std::list<std::string> convertLineToList(const std::string& line);

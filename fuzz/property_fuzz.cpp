@@ -11,7 +11,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
   bool fromOn = true;
   parseBoolProperty(value, fromOff);
   parseBoolProperty(value, fromOn);
-  const auto mode = parseTraceMode(value);
+  const auto mode = ParseTraceMode(value);
   if (mode == 0 && (fromOff || fromOn)) std::abort();
   if (mode == 1 && !(fromOff && fromOn)) std::abort();
   if (!mode && (fromOff || !fromOn)) std::abort();

@@ -13,28 +13,28 @@ namespace {
 
 using ManagerHandle = std::shared_ptr<zub::client::Manager>;
 
-void printLine(const std::string& line) { std::cout << line << std::endl; }
+void PrintLine(const std::string& line) { std::cout << line << std::endl; }
 
-void readFlag(const lumo::object& reply, bool& flag) {
+void ReadFlag(const lumo::object& reply, bool& flag) {
   parseBoolProperty(
       lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), zub::kUnknown), flag);
 }
 
 /// Whether the baseband trace goes over QDSS. `query` asks for another property of that trace.
-bool isHighThroughputOn(const ManagerHandle& manager, lumo::dict query) {
+bool IsHighThroughputOn(const ManagerHandle& manager, lumo::dict query) {
   bool on = false;
   if (!TelephonyCapabilitiesRadioDIAGSupportsQDSS()) return on;
   query.set(zub::kKeyTracePropertyName, zub::kKeyTraceHighTput);
   lumo::object reply;
   const auto result =
       zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty, query, &reply);
-  if (result.code == 0 && reply.isDict()) readFlag(reply, on);
+  if (result.code == 0 && reply.isDict()) ReadFlag(reply, on);
   return on;
 }
 
 /// The request for a dump, as the option words ask for it and the device allows. `mode` is set to
 /// the packaging that it asks for.
-lumo::dict dumpRequest(const LogdumpCommand& node, const std::list<std::string>& words,
+lumo::dict DumpRequest(const LogdumpCommand& node, const std::list<std::string>& words,
                        CompressionMode& mode) {
   mode = static_cast<CompressionMode>(defaults::compression::mode());
   std::string reason;
@@ -51,7 +51,7 @@ lumo::dict dumpRequest(const LogdumpCommand& node, const std::list<std::string>&
 }
 
 /// The timestamp of the helper service's system report; empty when there is none to be had.
-std::string askHelperForTimestamp() {
+std::string AskHelperForTimestamp() {
   constexpr zub::helper::TaskID kSystemReport = 4;
   constexpr std::int64_t kTimeout = 1500;
   if (!TelephonyUtilIsInternalBuild() && !TelephonyUtilIsCarrierBuild()) return {};
@@ -66,27 +66,27 @@ std::string askHelperForTimestamp() {
   return lumo::dyn_cast_or_default(reply.get(zub::helper::kKeyTimestampString), "");
 }
 
-void printServerSuccess(const lumo::object& reply, CompressionMode mode, bool qdss) {
-  printLine("Baseband log collection: Success (ZUB running)");
+void PrintServerSuccess(const lumo::object& reply, CompressionMode mode, bool qdss) {
+  PrintLine("Baseband log collection: Success (ZUB running)");
   const auto timestamp = lumo::dyn_cast_or_default(reply.get(zub::kKeyTimestampString), "");
-  printLine("Path = " + buildLogPath(timestamp, mode, zub::trace::getBasebandTraceDirSuffix(qdss)));
+  PrintLine("Path = " + buildLogPath(timestamp, mode, zub::trace::getBasebandTraceDirSuffix(qdss)));
 }
 
 /// Without a server nothing is packaged: the logs are in a snapshot folder, or still in the scratch
 /// folder of the trace.
-void printHelperSuccess(bool qdss) {
-  const auto timestamp = askHelperForTimestamp();
-  printLine("Baseband log collection: Success (ZUB not running)");
+void PrintHelperSuccess(bool qdss) {
+  const auto timestamp = AskHelperForTimestamp();
+  PrintLine("Baseband log collection: Success (ZUB not running)");
   if (timestamp.empty()) {
-    printLine(std::string("Path = ") + zub::trace::kScratchFolder +
+    PrintLine(std::string("Path = ") + zub::trace::kScratchFolder +
               (qdss ? diag::config::kQDSSScratchDir : diag::config::kDIAGScratchDir));
   } else {
-    printLine("Path = " + buildLogPath(timestamp, CompressionMode::none,
+    PrintLine("Path = " + buildLogPath(timestamp, CompressionMode::none,
                                        zub::trace::getBasebandTraceDirSuffix(qdss)));
   }
 }
 
-bool collect(const LogdumpCommand& node, const std::list<std::string>& words) {
+bool Collect(const LogdumpCommand& node, const std::list<std::string>& words) {
   constexpr auto kFailed = "Baseband log collection: Failed";
   lumo::dict query;
   query.set(zub::kKeyTraceName, zub::kTraceBaseband);
@@ -95,35 +95,35 @@ bool collect(const LogdumpCommand& node, const std::list<std::string>& words) {
   const auto asked =
       zub::client::PerformCommand(node.manager, zub::kCommandGetTraceProperty, query, &property);
   if (asked.code != 0 || !property.isDict()) {
-    printLine(kFailed);
+    PrintLine(kFailed);
     return asked.code == 0;
   }
   bool enabled = false;
-  readFlag(property, enabled);
+  ReadFlag(property, enabled);
   if (!enabled) {
-    printLine("Baseband logs are not enabled");
+    PrintLine("Baseband logs are not enabled");
     return true;
   }
-  const bool qdss = isHighThroughputOn(node.manager, query);
+  const bool qdss = IsHighThroughputOn(node.manager, query);
   CompressionMode mode{};
-  const auto request = dumpRequest(node, words, mode);
+  const auto request = DumpRequest(node, words, mode);
   lumo::object dump;
   const auto dumped =
       zub::client::PerformCommand(node.manager, zub::kCommandTraceDumpState, request, &dump);
   if (dumped.code == 0) {
-    printServerSuccess(dump, mode, qdss);
+    PrintServerSuccess(dump, mode, qdss);
   } else if (dumped.code == zub::kResultServerNotRunning) {
-    printHelperSuccess(qdss);
+    PrintHelperSuccess(qdss);
   } else {
-    printLine(kFailed);
+    PrintLine(kFailed);
   }
   return true;
 }
 
 }  // namespace
 
-CommandHandler basebandLogsHandler(const LogdumpCommand& node) {
+CommandHandler BasebandLogsHandler(const LogdumpCommand& node) {
   return [&node](const dispatch::group&, const std::list<std::string>& words) {
-    return collect(node, words);
+    return Collect(node, words);
   };
 }

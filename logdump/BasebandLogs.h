@@ -10,4 +10,4 @@ class LogdumpCommand;
 /// other failure shows in the printed lines.
 ///
 /// `node` is the command that registers the handler and thereby owns it, so it outlives it.
-CommandHandler basebandLogsHandler(const LogdumpCommand& node);
+CommandHandler BasebandLogsHandler(const LogdumpCommand& node);

@@ -8,31 +8,32 @@
 #include "logdump/TraceProperty.h"
 #include "tool/ServerState.h"
 
-std::shared_ptr<CommandBase> LogdumpCommand::create(
-    const std::string& commandName, std::weak_ptr<CommandBase> parentCommand,
-    std::shared_ptr<zub::client::Manager> serverManager, dispatch::queue toolQueue) {
-  std::shared_ptr<CommandBase> node(new LogdumpCommand(
-      commandName, std::move(parentCommand), std::move(serverManager), std::move(toolQueue)));
+std::shared_ptr<CommandBase> LogdumpCommand::create(const std::string& name,
+                                                    std::weak_ptr<CommandBase> parent,
+                                                    std::shared_ptr<zub::client::Manager> manager,
+                                                    dispatch::queue queue) {
+  std::shared_ptr<CommandBase> node(
+      new LogdumpCommand(name, std::move(parent), std::move(manager), std::move(queue)));
   node->init();
   return node;
 }
 
-bool LogdumpCommand::isAllowed(std::string handler) {
-  if (handler == "bb") return true;  // the helper service stands in for the server
+bool LogdumpCommand::isAllowed(std::string name) {
+  if (name == "bb") return true;  // the helper service stands in for the server
   if (IsServerRunning()) return true;
   std::cerr << kServerDownErrorPrint << std::endl;
   return false;
 }
 
 void LogdumpCommand::registerCommands() {
-  addCommandHandler("tel", telephonyLogsHandler(*this),
+  addCommandHandler("tel", TelephonyLogsHandler(*this),
                     "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs");
   addCommandHandler(
-      "core", telephonyLogsWithCoredumpHandler(*this),
+      "core", TelephonyLogsWithCoredumpHandler(*this),
       "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs with coredump");
-  addCommandHandler("bb", basebandLogsHandler(*this),
+  addCommandHandler("bb", BasebandLogsHandler(*this),
                     "[nocompress|tar.gz|tar] <reason> collect baseband logs only");
-  addCommandHandler("oslog", osLogHandler(),
+  addCommandHandler("oslog", OsLogHandler(),
                     "[history size] [output txt file path] -p <process1 process2..> -i "
                     "<imagePath1 imagePath2..> collect oslog to txt");
 }
@@ -44,6 +45,6 @@ bool LogdumpCommand::isSystemLogsTraceLite() const {
   request.set(zub::kKeyTracePropertyName, zub::kKeyTraceMode);
   lumo::object reply;
   zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty, request, &reply);
-  return parseTraceMode(lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), "")) ==
+  return ParseTraceMode(lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), "")) ==
          kLite;
 }

@@ -10,13 +10,13 @@ inline constexpr auto kServerDownErrorPrint =
 class LogdumpCommand : public ZUBCommandBase {
  public:
   /// Makes the node with its handlers. Threads: the shell thread.
-  static std::shared_ptr<CommandBase> create(const std::string& commandName,
-                                             std::weak_ptr<CommandBase> parentCommand,
-                                             std::shared_ptr<zub::client::Manager> serverManager,
-                                             dispatch::queue toolQueue);
+  static std::shared_ptr<CommandBase> create(const std::string& name,
+                                             std::weak_ptr<CommandBase> parent,
+                                             std::shared_ptr<zub::client::Manager> manager,
+                                             dispatch::queue queue);
 
   /// Refuses all handlers but `bb` while the server is not running.
-  bool isAllowed(std::string handler) override;
+  bool isAllowed(std::string name) override;
 
   /// Asks the server whether its system-logs trace runs in lite mode, and blocks until it has
   /// answered. No usable answer counts as no.

@@ -15,9 +15,3 @@ enum class CompressionMode : std::int32_t { none = 0, tarGz = 1, tar = 2 };
 /// set. Cannot fail. Any thread.
 void parseLogdumpOptions(std::list<std::string> words, CompressionMode& mode, std::string& reason,
                          bool& noUi);
-
-/// The path of the logs that the server has collected at `timestamp`. An archive's extension takes
-/// the place of `defaultSuffix`, which follows as it is when there is no archive. Cannot fail. Any
-/// thread.
-std::string buildLogPath(const std::string& timestamp, CompressionMode mode,
-                         const std::string& defaultSuffix);

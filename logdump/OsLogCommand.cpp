@@ -22,18 +22,18 @@ const char* const kDefaultProcesses[] = {"Orvalind",
 const char* const kDefaultImagePaths[] = {"Modemcore"};
 
 /// The whole number at the front of `word`, or 0, cut to the range of a signed 32-bit number.
-double readSeconds(const std::string& word) {
+double ReadSeconds(const std::string& word) {
   using Range = std::numeric_limits<std::int32_t>;
   const long long number = std::strtoll(word.c_str(), nullptr, 10);
   return static_cast<double>(std::clamp<long long>(number, Range::min(), Range::max()));
 }
 
 /// Sorts the words behind "-p" and "-i"; words behind any other option are dropped.
-void parseSelection(Words words, Words& processes, Words& imagePaths) {
+void ParseSelection(Words words, Words& processes, Words& imagePaths) {
   Words dropped;
   Words* chosen = &dropped;
   while (!words.empty()) {
-    auto word = takeNextWord(words);
+    auto word = TakeNextWord(words);
     if (!word.starts_with('-')) {
       chosen->push_back(std::move(word));
     } else {
@@ -42,29 +42,29 @@ void parseSelection(Words words, Words& processes, Words& imagePaths) {
   }
 }
 
-bool exportLog(Words words) {
+bool ExportLog(Words words) {
   if (words.size() < 2) {
     std::cout << "os log collection: Failed" << std::endl;
     return false;
   }
-  const double history = readSeconds(takeNextWord(words));
-  const auto path = takeNextWord(words);
+  const double history = ReadSeconds(TakeNextWord(words));
+  const auto path = TakeNextWord(words);
   Words processes;
   Words imagePaths;
   if (words.empty()) {
     processes.assign(std::begin(kDefaultProcesses), std::end(kDefaultProcesses));
     imagePaths.assign(std::begin(kDefaultImagePaths), std::end(kDefaultImagePaths));
   } else {
-    parseSelection(std::move(words), processes, imagePaths);
+    ParseSelection(std::move(words), processes, imagePaths);
   }
   return OsLogStream::putOsLogStreamToFile(path, processes, imagePaths, history);
 }
 
 }  // namespace
 
-CommandHandler osLogHandler() {
+CommandHandler OsLogHandler() {
   return [](const dispatch::group& group, const Words& words) {
     const dispatch::membership exporting(group);
-    return exportLog(words);
+    return ExportLog(words);
   };
 }

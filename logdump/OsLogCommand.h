@@ -6,4 +6,4 @@
 /// calling thread. Its words are the history in seconds, the file's path, and the processes and
 /// image paths behind "-p" and "-i". What fails in the export itself shows in the system log and in
 /// the result alone.
-CommandHandler osLogHandler();
+CommandHandler OsLogHandler();

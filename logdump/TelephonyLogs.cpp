@@ -17,7 +17,7 @@ struct Collection {
   std::string (*defaultSuffix)();
 };
 
-lumo::dict telephonyRequest(const std::string& reason, CompressionMode mode) {
+lumo::dict TelephonyRequest(const std::string& reason, CompressionMode mode) {
   lumo::dict request;
   request.set(zub::kKeyTraceAction, zub::kCollectTelephonyLogs);
   request.set(zub::kKeyTraceDumpStateReason, reason);
@@ -25,7 +25,7 @@ lumo::dict telephonyRequest(const std::string& reason, CompressionMode mode) {
   return request;
 }
 
-lumo::dict coredumpRequest(const std::string& reason, CompressionMode mode) {
+lumo::dict CoredumpRequest(const std::string& reason, CompressionMode mode) {
   lumo::dict request;
   request.set(zub::kKeyBasebandResetType, zub::kBasebandResetTypeHard);
   request.set(zub::kKeyBasebandResetSubType, zub::kBasebandResetSubTypeOtherErrors);
@@ -35,13 +35,13 @@ lumo::dict coredumpRequest(const std::string& reason, CompressionMode mode) {
   return request;
 }
 
-constexpr Collection kTelephony = {"Telephony log collection: ", telephonyRequest, true,
+constexpr Collection kTelephony = {"Telephony log collection: ", TelephonyRequest, true,
                                    [] { return std::string("-*"); }};
 constexpr Collection kTelephonyWithCoredump = {
-    "Telephony log collection with Coredump: ", coredumpRequest, false,
+    "Telephony log collection with Coredump: ", CoredumpRequest, false,
     zub::trace::getCoreDumpDirSuffix};
 
-void printOutcome(const Collection& collection, CompressionMode mode,
+void PrintOutcome(const Collection& collection, CompressionMode mode,
                   const TelephonyLumo::Result& result, const lumo::object& reply) {
   const bool succeeded = result.code == 0;
   std::cout << collection.label << (succeeded ? "Success" : "Failed") << std::endl;
@@ -50,7 +50,7 @@ void printOutcome(const Collection& collection, CompressionMode mode,
   std::cout << "Path = " << buildLogPath(timestamp, mode, collection.defaultSuffix()) << std::endl;
 }
 
-bool collect(const LogdumpCommand& node, const Collection& collection, const dispatch::group& group,
+bool Collect(const LogdumpCommand& node, const Collection& collection, const dispatch::group& group,
              const std::list<std::string>& words) {
   auto mode = static_cast<CompressionMode>(defaults::compression::mode());
   std::string reason;
@@ -65,24 +65,24 @@ bool collect(const LogdumpCommand& node, const Collection& collection, const dis
       node.manager, zub::kCommandTraceDumpState,
       [&collection, mode, collecting = sending](const TelephonyLumo::Result& result,
                                                 const lumo::object& reply) {
-        printOutcome(collection, mode, result, reply);
+        PrintOutcome(collection, mode, result, reply);
       },
       request);
   return true;
 }
 
-CommandHandler handlerOf(const LogdumpCommand& node, const Collection& collection) {
+CommandHandler HandlerOf(const LogdumpCommand& node, const Collection& collection) {
   return [&node, &collection](const dispatch::group& group, const std::list<std::string>& words) {
-    return collect(node, collection, group, words);
+    return Collect(node, collection, group, words);
   };
 }
 
 }  // namespace
 
-CommandHandler telephonyLogsHandler(const LogdumpCommand& node) {
-  return handlerOf(node, kTelephony);
+CommandHandler TelephonyLogsHandler(const LogdumpCommand& node) {
+  return HandlerOf(node, kTelephony);
 }
 
-CommandHandler telephonyLogsWithCoredumpHandler(const LogdumpCommand& node) {
-  return handlerOf(node, kTelephonyWithCoredump);
+CommandHandler TelephonyLogsWithCoredumpHandler(const LogdumpCommand& node) {
+  return HandlerOf(node, kTelephonyWithCoredump);
 }

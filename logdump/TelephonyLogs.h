@@ -9,7 +9,7 @@ class LogdumpCommand;
 /// is open until then.
 ///
 /// `node` is the command that registers the handler and thereby owns it, so it outlives it.
-CommandHandler telephonyLogsHandler(const LogdumpCommand& node);
+CommandHandler TelephonyLogsHandler(const LogdumpCommand& node);
 
 /// The same with a core dump of the modem, which resets the baseband.
-CommandHandler telephonyLogsWithCoredumpHandler(const LogdumpCommand& node);
+CommandHandler TelephonyLogsWithCoredumpHandler(const LogdumpCommand& node);

@@ -2,21 +2,40 @@
 
 #include "platform/telephony.h"
 
-namespace zub::trace {
 namespace {
 
-bool isKOV() { return TelephonyRadiosGetRadioVendor() == kTelephonyRadioVendorKOV; }
+bool IsKOV() { return TelephonyRadiosGetRadioVendor() == kTelephonyRadioVendorKOV; }
+
+/// The extension of an archive of that mode; `defaultSuffix` where there is none.
+std::string ExtensionOf(CompressionMode mode, const std::string& defaultSuffix) {
+  switch (mode) {
+    case CompressionMode::tarGz:
+      return std::string(".") + zub::trace::kLogTarGzExtension;
+    case CompressionMode::tar:
+      return std::string(".") + zub::trace::kLogTarExtension;
+    default:
+      return defaultSuffix;
+  }
+}
 
 }  // namespace
 
+namespace zub::trace {
+
 std::string getBasebandTraceDirSuffix(bool qdss) {
-  if (isKOV()) return kKOVTraceSnapshotDirectorySuffix;
+  if (IsKOV()) return kKOVTraceSnapshotDirectorySuffix;
   return qdss ? kZATQDSSTraceSnapshotDirectorySuffix : kZATTraceSnapshotDirectorySuffix;
 }
 
 std::string getCoreDumpDirSuffix() {
-  static const char* const suffix = isKOV() ? "-coredump" : "-cd";
+  static const char* const suffix = IsKOV() ? "-coredump" : "-cd";
   return suffix;
 }
 
 }  // namespace zub::trace
+
+std::string buildLogPath(const std::string& timestamp, CompressionMode mode,
+                         const std::string& defaultSuffix) {
+  return std::string(zub::trace::kSnapshotFolder) + zub::trace::kLogDirPrefix + timestamp +
+         ExtensionOf(mode, defaultSuffix);
+}

@@ -2,6 +2,8 @@
 
 #include <string>
 
+#include "logdump/LogdumpOptions.h"
+
 /// Where collected logs are written, and how they are named. Both folders end with "/".
 namespace zub::trace {
 
@@ -30,3 +32,9 @@ inline constexpr auto kDIAGScratchDir = "DIAG.scratch";
 inline constexpr auto kQDSSScratchDir = "QDSS.scratch";
 
 }  // namespace diag::config
+
+/// The path of the logs that the server has collected at `timestamp`. An archive's extension takes
+/// the place of `defaultSuffix`, which follows as it is when there is no archive. Cannot fail. Any
+/// thread.
+std::string buildLogPath(const std::string& timestamp, CompressionMode mode,
+                         const std::string& defaultSuffix);

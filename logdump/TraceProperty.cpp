@@ -12,7 +12,7 @@ namespace {
 
 enum class Word { none, off, on, full, lite };
 
-Word readWord(const std::string& value) {
+Word ReadWord(const std::string& value) {
   static constexpr struct {
     const char* text;
     Word word;
@@ -27,7 +27,7 @@ Word readWord(const std::string& value) {
 
 /// The base that the prefix of a number tells. Not left to strtoll, which knows more prefixes in
 /// newer C libraries.
-int baseOf(std::string_view number) {
+int BaseOf(std::string_view number) {
   number.remove_prefix(std::min(number.find_first_not_of(" \t\n\v\f\r"), number.size()));
   if (number.starts_with('+') || number.starts_with('-')) number.remove_prefix(1);
   if (number.starts_with("0x") || number.starts_with("0X")) return 16;
@@ -35,10 +35,10 @@ int baseOf(std::string_view number) {
 }
 
 /// All of `value` as a signed 64-bit number.
-std::optional<std::int64_t> readNumber(const std::string& value) {
+std::optional<std::int64_t> ReadNumber(const std::string& value) {
   char* end = nullptr;
   errno = 0;
-  const std::int64_t number = std::strtoll(value.c_str(), &end, baseOf(value));
+  const std::int64_t number = std::strtoll(value.c_str(), &end, BaseOf(value));
   const bool isWhole = end != value.c_str() && end == value.c_str() + value.size();
   if (!isWhole || errno == ERANGE) return std::nullopt;
   return number;
@@ -46,8 +46,8 @@ std::optional<std::int64_t> readNumber(const std::string& value) {
 
 }  // namespace
 
-std::optional<std::int32_t> parseTraceMode(const std::string& value) {
-  switch (readWord(value)) {
+std::optional<std::int32_t> ParseTraceMode(const std::string& value) {
+  switch (ReadWord(value)) {
     case Word::off:
       return 0;
     case Word::on:
@@ -59,14 +59,14 @@ std::optional<std::int32_t> parseTraceMode(const std::string& value) {
       break;
   }
   using Range = std::numeric_limits<std::int32_t>;
-  const auto number = readNumber(value);
+  const auto number = ReadNumber(value);
   if (!number || *number < Range::min() || *number > Range::max()) return std::nullopt;
   return static_cast<std::int32_t>(*number);
 }
 
 void parseBoolProperty(const std::string& value, bool& flag) {
-  const auto word = readWord(value);
-  const auto number = word == Word::none ? readNumber(value) : std::nullopt;
+  const auto word = ReadWord(value);
+  const auto number = word == Word::none ? ReadNumber(value) : std::nullopt;
   if (word == Word::off || number == 0) flag = false;
   if (word == Word::on || word == Word::full || word == Word::lite || number == 1) flag = true;
 }

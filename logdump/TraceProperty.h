@@ -11,7 +11,7 @@
 
 /// The mode of a trace: 0 off, 1 on or full, 2 lite, or any other signed 32-bit number; none for
 /// any other text.
-std::optional<std::int32_t> parseTraceMode(const std::string& value);
+std::optional<std::int32_t> ParseTraceMode(const std::string& value);
 
 /// Sets `flag` for a word (full and lite are on) or for the numbers 0 and 1; any other text leaves
 /// it as it was.

@@ -50,7 +50,7 @@ class LineFile {
 };
 
 /// Prepares the local store. Empty, and the reason in the system log, when that fails.
-StreamHandle prepareStream() {
+StreamHandle PrepareStream() {
   struct Outcome {
     std::mutex mutex;
     StreamHandle stream;
@@ -69,7 +69,7 @@ StreamHandle prepareStream() {
   return std::move(outcome->stream);
 }
 
-void setFilter(OSLogEventStream& stream, const std::list<std::string>& processes,
+void SetFilter(OSLogEventStream& stream, const std::list<std::string>& processes,
                const std::list<std::string>& imagePaths) {
   OSLogOrPredicate filter;
   for (const auto& process : processes) filter.terms.push_back({"process == %@", process});
@@ -81,7 +81,7 @@ void setFilter(OSLogEventStream& stream, const std::list<std::string>& processes
 
 /// Appends `number` to `text`, in at least `leastDigits` digits.
 template <class Number>
-void appendNumber(std::string& text, Number number, int base = 10, std::size_t leastDigits = 1) {
+void AppendNumber(std::string& text, Number number, int base = 10, std::size_t leastDigits = 1) {
   char digits[20];  // of any 64-bit number
   const char* const end = std::to_chars(digits, std::end(digits), number, base).ptr;
   const auto length = static_cast<std::size_t>(end - digits);
@@ -91,7 +91,7 @@ void appendNumber(std::string& text, Number number, int base = 10, std::size_t l
 
 /// "DATE 0xTHREAD 0xACTIVITY PID PROCESS(SENDER):SUBSYSTEM [CATEGORY] MESSAGE\n", the date being
 /// the wall-clock time of the device that logged.
-std::string formatLine(const OSLogEventProxy& event) {
+std::string FormatLine(const OSLogEventProxy& event) {
   constexpr std::size_t kMostForDateAndNumbers = 100;
   const std::string_view texts[] = {
       event.process(),  "(",  event.sender(),          "):", event.subsystem(), " [",
@@ -103,21 +103,21 @@ std::string formatLine(const OSLogEventProxy& event) {
   const auto date = event.date();
   date.addingSeconds(event.timeZone().secondsFromGMT(date)).appendDescription(line);
   line.append(" 0x");
-  appendNumber(line, event.threadIdentifier(), 16, 5);
+  AppendNumber(line, event.threadIdentifier(), 16, 5);
   line.append(" 0x");
-  appendNumber(line, event.activityIdentifier(), 16);
+  AppendNumber(line, event.activityIdentifier(), 16);
   line.push_back(' ');
-  appendNumber(line, event.processIdentifier());
+  AppendNumber(line, event.processIdentifier());
   line.push_back(' ');
   for (const auto text : texts) line.append(text);
   return line;
 }
 
-void setHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& file,
+void SetHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& file,
                  const std::string& path, const dispatch::group& group) {
   const std::weak_ptr<OSLogEventStream> weakStream = stream;  // the stream owns its handlers
   stream->setEventHandler([file, path, weakStream](const OSLogEventProxy& event) {
-    if (event.type() != kOSLogEventTypeLogMessage || file->append(formatLine(event))) return;
+    if (event.type() != kOSLogEventTypeLogMessage || file->append(FormatLine(event))) return;
     platform::logError("Failed to write file: " + path);
     if (const auto failing = weakStream.lock()) failing->invalidate();
   });
@@ -130,7 +130,7 @@ void setHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& fi
 }
 
 /// Streams the last `history` seconds. True when the stream ended within `timeout`.
-bool runStream(OSLogEventStream& stream, const dispatch::group& group, double history,
+bool RunStream(OSLogEventStream& stream, const dispatch::group& group, double history,
                std::chrono::nanoseconds timeout) {
   const auto start = OSLogDate::now().addingSeconds(-history);
   group.enter();
@@ -153,7 +153,7 @@ bool OsLogStream::putOsLogStreamToFile(const std::string& path,
 bool OsLogStream::putWithin(std::chrono::nanoseconds timeout, const std::string& path,
                             const std::list<std::string>& process,
                             const std::list<std::string>& imagePath, double history) {
-  const auto stream = prepareStream();
+  const auto stream = PrepareStream();
   if (!stream) return false;
   platform::createEmptyFile(path);
   auto opened = platform::FileHandle::openForAppending(path);
@@ -168,9 +168,9 @@ bool OsLogStream::putWithin(std::chrono::nanoseconds timeout, const std::string&
   }
   const auto file = std::make_shared<LineFile>(std::move(opened));
   stream->setFlags(kStreamFlags);
-  setFilter(*stream, process, imagePath);
-  setHandlers(stream, file, path, group);
-  const bool ended = runStream(*stream, group, history, timeout);
+  SetFilter(*stream, process, imagePath);
+  SetHandlers(stream, file, path, group);
+  const bool ended = RunStream(*stream, group, history, timeout);
   file->close();
   return ended && !file->hasFailed();
 }

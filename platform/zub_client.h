@@ -79,26 +79,25 @@ std::shared_ptr<Manager> CreateManager(const std::string& name, dispatch::queue 
 
 /// Calls `handler` for each event of that name from now on. The library keeps its reference to the
 /// handler for good; events that were reported before are not repeated.
-void RegisterEventHandler(const std::shared_ptr<Manager>& manager, const std::string& event,
+void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler);
 
 /// Stops the delivery of events. Events of this time are lost.
-void EventsOff(const std::shared_ptr<Manager>& manager);
+void EventsOff(std::shared_ptr<Manager> manager);
 
 /// Starts the delivery of events. When they were off, a server that has reported a state reports
 /// it anew; when they were on already, nothing happens.
-void EventsOn(const std::shared_ptr<Manager>& manager);
+void EventsOn(std::shared_ptr<Manager> manager);
 
 /// Sends `command` with `request` and blocks until the answer is there. `*reply`, which is the
 /// caller's and comes in as the null object, holds the reply afterwards; a request that failed
 /// leaves it null. The library sets no limit to the wait.
-TelephonyLumo::Result PerformCommand(const std::shared_ptr<Manager>& manager,
-                                     const std::string& command, const lumo::dict& request,
-                                     lumo::object* reply);
+TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
+                                     const lumo::dict& request, lumo::object* reply);
 
 /// Sends `command` with `request` and returns at once. `completion` runs once, on the manager's
 /// queue, and the library has released it before that queue takes its next task.
-void PerformCommand(const std::shared_ptr<Manager>& manager, const std::string& command,
+void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request);
 
 }  // namespace zub::client

@@ -71,7 +71,7 @@ class Node : public CommandBase {
         word,
         [this, word, result](const dispatch::group&, Words words) {
           std::cout << getHierarchy() << ':' << word << '(';
-          while (!words.empty()) std::cout << '<' << takeNextWord(words) << '>';
+          while (!words.empty()) std::cout << '<' << TakeNextWord(words) << '>';
           std::cout << ") ";
           return result;
         },

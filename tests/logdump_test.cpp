@@ -15,7 +15,7 @@ namespace {
 
 TEST(TraceProperty, ReadsWordsAndNumbers) {
   for (const auto& row : readTable("trace-property", 3)) {
-    const auto mode = parseTraceMode(row[0]);
+    const auto mode = ParseTraceMode(row[0]);
     EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]) << '"' << row[0] << '"';
     for (const bool before : {false, true}) {
       bool after = before;
@@ -69,9 +69,9 @@ TEST(ServerState, RunsOnlyInTheStartedState) {
                                  stateIs(stateIs("Started"))};
   EXPECT_FALSE(IsServerRunning());
   for (const auto& other : others) {
-    NoteServerState(stateIs("Started"));
+    SetServerState(stateIs("Started"));
     EXPECT_TRUE(IsServerRunning());
-    NoteServerState(other);
+    SetServerState(other);
     EXPECT_FALSE(IsServerRunning());
   }
 }

@@ -174,7 +174,7 @@ TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
     auto words = convertLineToList(row[0]);
     std::ranges::replace(words, "OUT", output);
     const auto group = dispatch::group::create();
-    EXPECT_TRUE(osLogHandler()(group, words)) << row[0];
+    EXPECT_TRUE(OsLogHandler()(group, words)) << row[0];
     EXPECT_TRUE(group.wait(0ns));
     std::string asked;
     for (const auto& call : calls) {

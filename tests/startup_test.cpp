@@ -27,7 +27,7 @@ TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
                {1, 0, "", "radio Orvalind product modemd ", false}};
   for (const auto& one : cases) {
     device = {one.radio, one.product, one.running, ""};
-    EXPECT_EQ(whyNotToStart() == nullptr, one.starts) << one.asked;
+    EXPECT_EQ(WhyNotToStart() == nullptr, one.starts) << one.asked;
     EXPECT_EQ(device.asked, one.asked);
   }
 }

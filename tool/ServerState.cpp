@@ -12,7 +12,7 @@ std::atomic<bool> gServerRunning = false;
 
 bool IsServerRunning() { return gServerRunning.load(std::memory_order_relaxed); }
 
-void NoteServerState(const lumo::object& payload) {
+void SetServerState(const lumo::object& payload) {
   const auto state = lumo::dyn_cast_or_default(payload.get(zub::kKeyServerState), "");
   gServerRunning.store(state == zub::kServerStateStarted, std::memory_order_relaxed);
 }

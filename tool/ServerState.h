@@ -8,4 +8,4 @@ bool IsServerRunning();
 
 /// Takes in the payload of a server-state event. What is not exactly the started state, malformed
 /// payloads included, counts as not running. Called on the tool queue.
-void NoteServerState(const lumo::object& payload);
+void SetServerState(const lumo::object& payload);

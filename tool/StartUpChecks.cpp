@@ -5,7 +5,7 @@
 
 namespace {
 
-bool daemonsAreRunning() {
+bool DaemonsAreRunning() {
   // Both are asked, whatever the first answer.
   const bool telephony = tlu::isProcessRunning("Orvalind");
   const bool watch = config::hw::watch();
@@ -14,9 +14,9 @@ bool daemonsAreRunning() {
 
 }  // namespace
 
-const char* whyNotToStart() {
+const char* WhyNotToStart() {
   if (TelephonyRadiosGetRadio() == 0) return "'zubtool' is not supported on this product.";
-  if (!daemonsAreRunning()) {
+  if (!DaemonsAreRunning()) {
     return "Orvalind process is not running. Please run/load Orvalind (or modemd) and try again.";
   }
   return nullptr;

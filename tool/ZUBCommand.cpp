@@ -2,12 +2,12 @@
 
 #include "logdump/LogdumpCommand.h"
 
-std::shared_ptr<CommandBase> ZUBCommand::create(const std::string& commandName,
-                                                std::weak_ptr<CommandBase> parentCommand,
-                                                std::shared_ptr<zub::client::Manager> serverManager,
-                                                dispatch::queue toolQueue) {
-  std::shared_ptr<CommandBase> node(new ZUBCommand(commandName, std::move(parentCommand),
-                                                   std::move(serverManager), std::move(toolQueue)));
+std::shared_ptr<CommandBase> ZUBCommand::create(const std::string& name,
+                                                std::weak_ptr<CommandBase> parent,
+                                                std::shared_ptr<zub::client::Manager> manager,
+                                                dispatch::queue queue) {
+  std::shared_ptr<CommandBase> node(
+      new ZUBCommand(name, std::move(parent), std::move(manager), std::move(queue)));
   node->init();
   return node;
 }

@@ -6,10 +6,10 @@
 class ZUBCommand : public ZUBCommandBase {
  public:
   /// Makes the root and the whole tree below it. Threads: the shell thread.
-  static std::shared_ptr<CommandBase> create(const std::string& commandName,
-                                             std::weak_ptr<CommandBase> parentCommand,
-                                             std::shared_ptr<zub::client::Manager> serverManager,
-                                             dispatch::queue toolQueue);
+  static std::shared_ptr<CommandBase> create(const std::string& name,
+                                             std::weak_ptr<CommandBase> parent,
+                                             std::shared_ptr<zub::client::Manager> manager,
+                                             dispatch::queue queue);
 
  private:
   using ZUBCommandBase::ZUBCommandBase;

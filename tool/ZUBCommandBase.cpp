@@ -1,11 +1,7 @@
 #include "tool/ZUBCommandBase.h"
 
-ZUBCommandBase::ZUBCommandBase(const std::string& commandName,
-                               std::weak_ptr<CommandBase> parentCommand,
-                               std::shared_ptr<zub::client::Manager> serverManager,
-                               dispatch::queue toolQueue)
-    : CommandBase(commandName, std::move(parentCommand)),
-      manager(std::move(serverManager)),
-      queue(std::move(toolQueue)) {}
+ZUBCommandBase::ZUBCommandBase(const std::string& name, std::weak_ptr<CommandBase> parent,
+                               std::shared_ptr<zub::client::Manager> manager, dispatch::queue queue)
+    : CommandBase(name, std::move(parent)), manager(std::move(manager)), queue(std::move(queue)) {}
 
 ZUBCommandBase::~ZUBCommandBase() = default;

@@ -8,8 +8,8 @@
 /// The manager and the queue are shared by all nodes and live at least as long as any of them.
 class ZUBCommandBase : public CommandBase {
  protected:
-  ZUBCommandBase(const std::string& commandName, std::weak_ptr<CommandBase> parentCommand,
-                 std::shared_ptr<zub::client::Manager> serverManager, dispatch::queue toolQueue);
+  ZUBCommandBase(const std::string& name, std::weak_ptr<CommandBase> parent,
+                 std::shared_ptr<zub::client::Manager> manager, dispatch::queue queue);
 
  public:
   ~ZUBCommandBase() override;

@@ -25,7 +25,7 @@ extern "C" void* runShellThread(void* words) {
 int main(int argc, char** argv) {
   platform::openStandardStreams();
   auto words = CommandShell::convertCmdArgsToList(argc, argv);
-  if (const char* const why = whyNotToStart()) {
+  if (const char* const why = WhyNotToStart()) {
     std::cout << why << std::endl;
     return kCannotStart;
   }

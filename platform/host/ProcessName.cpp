@@ -17,6 +17,6 @@ std::string_view processName(std::string_view comm, std::string_view exePath) {
   return file.starts_with(comm) ? file : comm;
 }
 
-std::string_view keptByKernel(std::string_view name) { return name.substr(0, kKernelLimit); }
+std::string_view truncatedByKernel(std::string_view name) { return name.substr(0, kKernelLimit); }
 
 }  // namespace host

@@ -17,6 +17,6 @@ std::string_view fileName(std::string_view path);
 std::string_view processName(std::string_view comm, std::string_view exePath);
 
 /// What the kernel keeps of the name of a process.
-std::string_view keptByKernel(std::string_view name);
+std::string_view truncatedByKernel(std::string_view name);
 
 }  // namespace host

@@ -170,25 +170,24 @@ std::shared_ptr<Manager> CreateManager(const std::string& /*name*/, dispatch::qu
   return manager;
 }
 
-void RegisterEventHandler(const std::shared_ptr<Manager>& manager, const std::string& event,
+void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler) {
   keepForGood(manager);
   manager->addHandler(event, std::move(handler));
 }
 
-void EventsOff(const std::shared_ptr<Manager>& manager) { manager->switchEvents(false); }
+void EventsOff(std::shared_ptr<Manager> manager) { manager->switchEvents(false); }
 
-void EventsOn(const std::shared_ptr<Manager>& manager) { manager->switchEvents(true); }
+void EventsOn(std::shared_ptr<Manager> manager) { manager->switchEvents(true); }
 
-TelephonyLumo::Result PerformCommand(const std::shared_ptr<Manager>& manager,
-                                     const std::string& command, const lumo::dict& request,
-                                     lumo::object* reply) {
+TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
+                                     const lumo::dict& request, lumo::object* reply) {
   const auto arrival = arrive(*manager, command, request);
   std::this_thread::sleep_for(arrival.delay);
   return answer(arrival, command, request, reply);
 }
 
-void PerformCommand(const std::shared_ptr<Manager>& manager, const std::string& command,
+void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request) {
   const auto arrival = arrive(*manager, command, request);
   dispatch::block<void()> task = [arrival, command, request, completion = std::move(completion)] {

@@ -99,7 +99,7 @@ const char* endOfLine(const char* start) {
   }
 }
 
-constexpr std::string_view kRemark = "-- ";
+constexpr std::string_view kSeparatorPrefix = "-- ";
 
 /// Behind the bytes in the buffer: the newline that ends every search, and what is read with it.
 constexpr std::size_t kMargin = sizeof(std::uint64_t);
@@ -163,7 +163,7 @@ bool EntryReader::readField() {
     ++position;
     return true;
   }
-  return skipRemark(lineEnd);
+  return skipSeparator(lineEnd);
 }
 
 Field EntryReader::wanted(std::string_view name) {
@@ -172,11 +172,11 @@ Field EntryReader::wanted(std::string_view name) {
   return field != Field::none && !current.has(field) ? field : Field::none;
 }
 
-bool EntryReader::skipRemark(const char* lineEnd) {
-  if (begun || *position != kRemark[0]) return damagedBy("not a field name");
+bool EntryReader::skipSeparator(const char* lineEnd) {
+  if (begun || *position != kSeparatorPrefix[0]) return damagedBy("not a field name");
   if (lineEnd == limit) return rest() < kBuffer ? refill() : damagedBy("a line is too long");
   const std::string_view line(position, static_cast<std::size_t>(lineEnd - position));
-  if (!line.starts_with(kRemark)) return damagedBy("not a field name");
+  if (!line.starts_with(kSeparatorPrefix)) return damagedBy("not a field name");
   position = lineEnd + 1;
   return true;
 }

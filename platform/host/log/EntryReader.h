@@ -101,7 +101,7 @@ class EntryReader {
   // Each of these is false when the log ends there, with `outcome` set. `field` is none where the
   // value is not wanted; `lineEnd` is `limit` where the line goes on behind it.
   bool readField();
-  bool skipRemark(const char* lineEnd);
+  bool skipSeparator(const char* lineEnd);
   bool readText(Field field, const char* lineEnd);
   bool readBinary(Field field);
   bool readLength(std::uint64_t& length);

@@ -152,7 +152,7 @@ std::vector<std::string> exportArguments(const std::string& folder, OSLogDate fr
   const auto names = filter.processes();
   if (!names || names->empty() || !std::ranges::all_of(*names, isPlain)) return arguments;
   for (const std::string& name : *names) {
-    arguments.push_back("_COMM=" + std::string(keptByKernel(name)));
+    arguments.push_back("_COMM=" + std::string(truncatedByKernel(name)));
   }
   arguments.emplace_back("+");
   for (const std::string& name : *names) arguments.push_back("SYSLOG_IDENTIFIER=" + name);
