@@ -37,7 +37,7 @@ bool CommandBase::execCommand(const std::string& name, const std::list<std::stri
   const auto found = commandHandlers.find(name);
   if (found == commandHandlers.end()) return false;
   const auto group = dispatch::group::create();
-  if (!group) return false;  // work on no group could not be waited for
+  if (!group) return false;  // nothing would wait for the handler's work
   const bool succeeded = found->second(group, words);
   group.wait();
   return succeeded;

@@ -57,7 +57,7 @@ CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
     }
     if (!currentCommand->isAllowed(word)) return Outcome::failed;
     currentCommand = currentCommand->getSubCommandObj(word);
-    if (words.empty()) {  // a sub-command alone does nothing: show what it could do
+    if (words.empty()) {  // a sub-command alone does nothing: show what it offers
       currentCommand->displayHelp();
       return Outcome::failed;
     }

@@ -10,7 +10,7 @@
 /// its front. Producers insert each new word at the front; consumers take the next word from the
 /// back. Words are bytes: nothing is decoded, unquoted or unescaped.
 ///
-/// Pure functions: no state, no errors, any thread.
+/// Pure functions: no state, no errors.
 
 /// Takes the next word in typing order off `words`, which must not be empty.
 std::string TakeNextWord(std::list<std::string>& words);

@@ -38,7 +38,7 @@ lumo::dict DumpRequest(const LogdumpCommand& node, const std::list<std::string>&
                        CompressionMode& mode) {
   mode = static_cast<CompressionMode>(defaults::compression::mode());
   std::string reason;
-  bool noUi = false;  // this collection asks nobody for confirmation
+  bool noUi = false;  // this collection asks for no confirmation
   parseLogdumpOptions(words, mode, reason, noUi);
   if (node.isSystemLogsTraceLite() || !defaults::compression::supported()) {
     mode = CompressionMode::none;
@@ -50,7 +50,7 @@ lumo::dict DumpRequest(const LogdumpCommand& node, const std::list<std::string>&
   return request;
 }
 
-/// The timestamp of the helper service's system report; empty when there is none to be had.
+/// The timestamp of the helper service's system report; empty when there is none.
 std::string AskHelperForTimestamp() {
   constexpr zub::helper::TaskID kSystemReport = 4;
   constexpr std::int64_t kTimeout = 1500;

@@ -9,7 +9,7 @@ inline constexpr auto kServerDownErrorPrint =
 /// The command `logdump`: the handlers `tel`, `core`, `bb` and `oslog`, which collect logs.
 class LogdumpCommand : public ZUBCommandBase {
  public:
-  /// Makes the node with its handlers. Threads: the shell thread.
+  /// Makes the node with its handlers.
   static std::shared_ptr<CommandBase> create(const std::string& name,
                                              std::weak_ptr<CommandBase> parent,
                                              std::shared_ptr<zub::client::Manager> manager,

@@ -5,7 +5,7 @@
 
 namespace {
 
-/// The text in front of each reason, by which the server's users tell who asked.
+/// Starts each reason, so that readers of the server's logs see who asked.
 constexpr auto kReasonPrefix = "[zubtool] ";
 constexpr auto kDefaultReason = "[zubtool] User triggered";
 

@@ -12,6 +12,6 @@ enum class CompressionMode : std::int32_t { none = 0, tarGz = 1, tar = 2 };
 /// reading.
 ///
 /// `mode` and `noUi` keep what the caller set where no option says otherwise; `reason` is always
-/// set. Cannot fail. Any thread.
+/// set. Cannot fail.
 void parseLogdumpOptions(std::list<std::string> words, CompressionMode& mode, std::string& reason,
                          bool& noUi);

@@ -28,7 +28,7 @@ double ReadSeconds(const std::string& word) {
   return static_cast<double>(std::clamp<long long>(number, Range::min(), Range::max()));
 }
 
-/// Sorts the words behind "-p" and "-i"; words behind any other option are dropped.
+/// Sorts the words after "-p" and "-i"; words after any other option are dropped.
 void ParseSelection(Words words, Words& processes, Words& imagePaths) {
   Words dropped;
   Words* chosen = &dropped;

@@ -4,6 +4,6 @@
 
 /// The handler that exports the recent system log of chosen processes into a text file, on the
 /// calling thread. Its words are the history in seconds, the file's path, and the processes and
-/// image paths behind "-p" and "-i". What fails in the export itself shows in the system log and in
-/// the result alone.
+/// image paths after "-p" and "-i". A failure of the export itself shows in the result and, with
+/// its reason, in the system log.
 CommandHandler OsLogHandler();

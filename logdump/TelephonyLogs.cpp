@@ -9,7 +9,7 @@
 
 namespace {
 
-/// What tells the two collections apart. There is one constant object for each.
+/// Where the two collections differ. There is one constant object for each.
 struct Collection {
   const char* label;
   lumo::dict (*makeRequest)(const std::string& reason, CompressionMode mode);

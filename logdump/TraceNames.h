@@ -17,11 +17,11 @@ inline constexpr auto kZATTraceSnapshotDirectorySuffix = "-diag";
 inline constexpr auto kZATQDSSTraceSnapshotDirectorySuffix = "-qdss";
 
 /// The suffix of a snapshot folder on this radio; `qdss` says whether high-throughput tracing is
-/// on. Asks for the radio's vendor at every call. Any thread.
+/// on. Asks for the radio's vendor at every call.
 std::string getBasebandTraceDirSuffix(bool qdss);
 
-/// The suffix of a core dump folder on this radio. The first call in the process decides for all:
-/// the vendor is asked once. Any thread.
+/// The suffix of a core dump folder on this radio. The vendor is asked once, by the first call in
+/// the process; every later call gives the same text.
 std::string getCoreDumpDirSuffix();
 
 }  // namespace zub::trace
@@ -34,7 +34,6 @@ inline constexpr auto kQDSSScratchDir = "QDSS.scratch";
 }  // namespace diag::config
 
 /// The path of the logs that the server has collected at `timestamp`. An archive's extension takes
-/// the place of `defaultSuffix`, which follows as it is when there is no archive. Cannot fail. Any
-/// thread.
+/// the place of `defaultSuffix`, which follows as it is when there is no archive. Cannot fail.
 std::string buildLogPath(const std::string& timestamp, CompressionMode mode,
                          const std::string& defaultSuffix);

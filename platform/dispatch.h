@@ -13,8 +13,7 @@ namespace dispatch {
 /// Counts work that is under way, so that one thread can wait until all of it has ended.
 ///
 /// A copy is another reference to the same group; the group lives as long as any reference. A
-/// default-made group is empty: it holds nothing, may be entered, left and waited on, and all of
-/// that does nothing.
+/// default-made group is empty: to enter it, leave it or wait on it does nothing.
 ///
 /// Threads: every member may be called from any thread. Each enter must be matched by exactly one
 /// leave; a leave without an enter ends the process. Prefer `membership`, which pairs them.
@@ -97,10 +96,10 @@ class block<Result(Arguments...)> {
 ///
 /// A copy is another reference to the same queue; a default-made queue holds none, and drops what
 /// it is given. Threads: every member may be called from any thread, tasks included; two tasks
-/// never overlap. Lifetime: tasks already given still run after the last reference has gone; each
-/// is released before the next one starts. At process exit, what has not run is dropped. Errors: a
-/// task must not throw; one that does ends the process. A queue whose thread cannot be started
-/// throws `std::system_error` when it is made.
+/// never overlap. Lifetime: tasks already given still run after the last reference is gone; each
+/// is released before the next one starts. At process exit, tasks that have not run are dropped.
+/// Errors: a task must not throw; one that does ends the process. A queue whose thread cannot be
+/// started throws `std::system_error` when it is made.
 class queue {
  public:
   queue() = default;
@@ -110,7 +109,7 @@ class queue {
 
   explicit operator bool() const noexcept { return worker != nullptr; }
 
-  /// Appends `task`, which must not be empty, and returns at once.
+  /// Appends `task`, which must not be empty, and does not wait for it.
   void async(block<void()> task) const;
 
   /// True when both refer to the same queue.

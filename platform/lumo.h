@@ -6,7 +6,7 @@
 #include <variant>
 #include <vector>
 
-/// The values that requests and replies are made of. Plain data: no threads, no errors.
+/// The values that requests and replies are made of. Plain data, without errors.
 namespace lumo {
 
 class object;

@@ -16,7 +16,7 @@
 /// log to a handler, in the order of the log, from a date on, until the log ends or the stream is
 /// invalidated.
 
-/// A point in absolute time, to the microsecond. Any thread.
+/// A point in absolute time, to the microsecond.
 class OSLogDate {
  public:
   static OSLogDate now();
@@ -39,8 +39,8 @@ class OSLogDate {
   std::int64_t microseconds;
 };
 
-/// A time zone: a fixed offset, or this machine's local zone with its summer times. Any thread; a
-/// change of the local zone while the process runs need not be seen.
+/// A time zone: a fixed offset, or this machine's local zone with its summer times. A change of the
+/// local zone while the process runs need not be seen.
 class OSLogTimeZone {
  public:
   /// The machine's local zone.
@@ -57,8 +57,8 @@ class OSLogTimeZone {
 /// The type of an event that is a log message.
 inline constexpr std::uint32_t kOSLogEventTypeLogMessage = 1024;
 
-/// One event of the log. The store owns it and every text that it hands out; both are valid until
-/// the event handler returns. All texts are UTF-8.
+/// One event of the log. The store owns the event and its texts, which are valid until the event
+/// handler returns. All texts are UTF-8.
 class OSLogEventProxy {
  public:
   virtual ~OSLogEventProxy() = default;
@@ -104,7 +104,7 @@ class OSLogEventSource {
 /// Where in the log a stream stood when it ended. Opaque.
 class OSLogEventStreamPosition {};
 
-/// The reason with which a stream ends when the log has been delivered whole.
+/// The reason with which a stream ends at the end of the log.
 inline constexpr unsigned long kOSLogEventStreamEndOfLog = 5;
 
 /// Delivers the events of a source. It takes its settings before it is activated, and is activated

@@ -17,8 +17,8 @@ struct Result {
 
 }  // namespace TelephonyLumo
 
-/// Names of the baseband manager server's protocol. Their texts are the client library's, and so
-/// are the objects behind them.
+/// Names of the baseband manager server's protocol. The client library defines these objects and
+/// their texts.
 namespace zub {
 
 extern const char* const kCommandGetTraceProperty;
@@ -59,9 +59,9 @@ inline constexpr auto kResultServerNotRunning = static_cast<std::int32_t>(0xE020
 
 /// The client library of the baseband manager server.
 ///
-/// Threads: every function may be called from any thread. Handlers and completions run on the
-/// queue that the manager was made with, one at a time. Errors: a request's are in its result; what
-/// the system cannot give, such as a thread, is thrown as `std::system_error`.
+/// Threads: handlers and completions run on the queue that the manager was made with, one at a
+/// time. Errors: a request's are in its result; what the system cannot give, such as a thread, is
+/// thrown as `std::system_error`.
 namespace zub::client {
 
 /// One client's connection to the server. Opaque; shared by handle.
@@ -73,25 +73,25 @@ using EventHandler = dispatch::block<void(lumo::object payload, dispatch::group)
 /// Receives the result of a request and its reply, a dictionary on success.
 using Completion = dispatch::block<void(TelephonyLumo::Result result, lumo::object reply)>;
 
-/// Makes a manager for the client that the server is to know as `name`, with callbacks on `queue`.
-/// Never null. Its events are on, as after `EventsOn`.
+/// Makes a manager for the client called `name`, with callbacks on `queue`. Never null. Its events
+/// are on, as after `EventsOn`.
 std::shared_ptr<Manager> CreateManager(const std::string& name, dispatch::queue queue);
 
 /// Calls `handler` for each event of that name from now on. The library keeps its reference to the
-/// handler for good; events that were reported before are not repeated.
+/// handler until the process exits; events that were reported before are not repeated.
 void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler);
 
-/// Stops the delivery of events. Events of this time are lost.
+/// Stops the delivery of events. Those that occur until it is started again are lost.
 void EventsOff(std::shared_ptr<Manager> manager);
 
 /// Starts the delivery of events. When they were off, a server that has reported a state reports
 /// it anew; when they were on already, nothing happens.
 void EventsOn(std::shared_ptr<Manager> manager);
 
-/// Sends `command` with `request` and blocks until the answer is there. `*reply`, which is the
-/// caller's and comes in as the null object, holds the reply afterwards; a request that failed
-/// leaves it null. The library sets no limit to the wait.
+/// Sends `command` with `request` and blocks until it is answered, without a time-out. `*reply`,
+/// which is the caller's and comes in as the null object, holds the reply afterwards; a request
+/// that failed leaves it null.
 TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                                      const lumo::dict& request, lumo::object* reply);
 

@@ -22,7 +22,7 @@ extern const char* const kKeyTimestampString;
 
 namespace zub {
 
-/// A client of the privileged helper service, which answers also while the server is down.
+/// A client of the privileged helper service, which also answers while the server is down.
 class HelperClient {
  public:
   /// Makes a client called `name` that logs to `logServer`, which may be null. Null when the
@@ -33,8 +33,7 @@ class HelperClient {
   virtual ~HelperClient() = default;
 
   /// Performs one task and blocks until it is done. `*reply`, which is the caller's and comes in as
-  /// an empty dictionary, holds the reply afterwards; a task that failed leaves it empty. Call it
-  /// on one thread at a time.
+  /// an empty dictionary, holds the reply afterwards; a task that failed leaves it empty.
   virtual TelephonyLumo::Result perform(helper::TaskID task, const std::string& command,
                                         const lumo::dict& parameters, lumo::object* reply) = 0;
 };

@@ -1,6 +1,5 @@
 #pragma once
 
-/// Why the tool cannot run on this device, for a person; null when it can. The product must have a
-/// cellular radio, and the telephony or the baseband daemon must run, but a watch may do without
-/// them. Any thread.
+/// The message that says why the tool cannot run on this device; null when it can. The product must
+/// have a cellular radio, and, unless it is a watch, the telephony or the baseband daemon must run.
 const char* WhyNotToStart();

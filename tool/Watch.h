@@ -2,7 +2,7 @@
 
 namespace config::hw {
 
-/// Whether this product is a watch. Any thread.
+/// Whether this product is a watch.
 bool watch();
 
 }  // namespace config::hw

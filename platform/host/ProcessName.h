@@ -8,10 +8,10 @@ namespace host {
 /// ends it.
 std::string_view fileName(std::string_view path);
 
-/// The name of a process: `comm`, its name as the kernel keeps it, or the whole of what the kernel
-/// has cut. The kernel keeps 15 bytes; where `comm` is that long and the file name of the
+/// The name of a process: `comm`, its name as the kernel keeps it, completed where the kernel has
+/// cut it. The kernel keeps 15 bytes (proc(5)); where `comm` is that long and the file name of the
 /// executable `exePath` starts with it, that file name is the name. The " (deleted)" that the
-/// kernel adds to the path of an executable which is gone is not part of it.
+/// kernel adds to the path of a removed executable is not part of it.
 ///
 /// Either may be empty. The result lies in one of the two.
 std::string_view processName(std::string_view comm, std::string_view exePath);

@@ -83,7 +83,7 @@ void runTasks(Tasks& tasks) {
 
 }  // namespace
 
-/// Shared by the references alone, so that its end tells the thread that no task can come any more.
+/// Shared by the references alone: when it goes, the thread knows that no further task can come.
 struct queue::Worker {
   std::shared_ptr<Tasks> tasks = std::make_shared<Tasks>();
 
