@@ -205,7 +205,7 @@ constexpr Key kKeys[] = {
     {"compression-supported", kYesNo,
      [](Text t, Profile& p) { return readYesNo(t, p.compressionSupported); }},
     {"processes", "names of processes", readProcesses, true},
-    {"server", "none, or steps 'MS STATE' in order of time, parted by commas",
+    {"server", "none, or steps 'MS STATE' in order of time, separated by commas",
      [](Text t, Profile& p) { return readServer(t, p.server); }},
     {"system-logs-mode", kTextOrFault,
      [](Text t, Profile& p) { return readTextOrFault(t, p.systemLogsMode); }, true},
