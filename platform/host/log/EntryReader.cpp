@@ -1,6 +1,6 @@
 #include "platform/host/log/EntryReader.h"
 
-#include <bit>
+#include <algorithm>
 #include <charconv>
 #include <cstring>
 
@@ -26,46 +26,9 @@ constexpr std::array<std::string_view, static_cast<std::size_t>(Field::none)> kN
     "MESSAGE",
 };
 
-/// The one of `Candidates`, which are all as long as `name`, that is called `name`.
-template <Field... Candidates>
-Field oneOf(std::string_view name) {
-  Field found = Field::none;
-  const auto matches = [&]<Field Candidate>() {
-    constexpr std::string_view kName = kNames[static_cast<std::size_t>(Candidate)];
-    if (std::memcmp(name.data(), kName.data(), kName.size()) == 0) found = Candidate;
-  };
-  (matches.template operator()<Candidates>(), ...);
-  return found;
-}
-
-/// Told apart by length first: most fields of a real log are none of these.
 Field fieldCalled(std::string_view name) {
-  switch (name.size()) {
-    case 3:
-      return oneOf<Field::tid>(name);
-    case 4:
-      return oneOf<Field::pid, Field::exe>(name);
-    case 5:
-      return oneOf<Field::comm>(name);
-    case 7:
-      return oneOf<Field::message>(name);
-    case 8:
-      return oneOf<Field::type>(name);
-    case 10:
-      return oneOf<Field::transport, Field::gmtOffset, Field::syslogPid>(name);
-    case 12:
-      return oneOf<Field::activity, Field::category>(name);
-    case 13:
-      return oneOf<Field::systemdUnit, Field::subsystem>(name);
-    case 15:
-      return oneOf<Field::senderPath>(name);
-    case 17:
-      return oneOf<Field::syslogIdentifier>(name);
-    case 20:
-      return oneOf<Field::realtimeTimestamp>(name);
-    default:
-      return Field::none;
-  }
+  const auto* const found = std::ranges::find(kNames, name);
+  return static_cast<Field>(found - kNames.begin());
 }
 
 constexpr std::array<bool, 256> kNameBytes = [] {
@@ -82,32 +45,16 @@ const char* endOfName(const char* start) {
   return start;
 }
 
-/// The first newline from `start` on, eight bytes at a time. At the end of the buffer there is one.
-const char* endOfLine(const char* start) {
-  constexpr std::uint64_t kOnes = 0x0101010101010101U;
-  for (;; start += sizeof kOnes) {
-    std::uint64_t word = 0;
-    std::memcpy(&word, start, sizeof word);
-    word ^= kOnes * '\n';
-    // The lowest bit that this sets is that of the first byte which is 0 now.
-    const std::uint64_t zeros = (word - kOnes) & ~word & (kOnes << 7);
-    if (zeros == 0) continue;
-    if constexpr (std::endian::native == std::endian::little) {
-      return start + std::countr_zero(zeros) / 8;
-    }
-    return static_cast<const char*>(std::memchr(start, '\n', sizeof word));
-  }
-}
-
 constexpr std::string_view kSeparatorPrefix = "-- ";
-
-/// Behind the bytes in the buffer: the newline that ends every search, and what is read with it.
-constexpr std::size_t kMargin = sizeof(std::uint64_t);
 
 }  // namespace
 
 EntryReader::EntryReader(ByteSource& bytes)
-    : source(bytes), buffer(kBuffer + kMargin, '\n'), position(buffer.data()), limit(position) {}
+    : source(bytes), buffer(kBuffer + 1, '\n'), position(buffer.data()), limit(position) {}
+
+const char* EntryReader::endOfLine() const {
+  return static_cast<const char*>(std::memchr(position, '\n', rest() + 1));
+}
 
 EntryReader::Result EntryReader::next() {
   do {
@@ -143,7 +90,7 @@ bool EntryReader::readEntry() {
 
 bool EntryReader::readField() {
   // The end of the line first: the next field can be looked at before this one is understood.
-  const char* const lineEnd = endOfLine(position);
+  const char* const lineEnd = endOfLine();
   const char* const nameEnd = endOfName(position);
   const auto size = static_cast<std::size_t>(nameEnd - position);
   if (size > kMaxName) return damagedBy("a field name is too long");
@@ -186,7 +133,7 @@ bool EntryReader::readText(Field field, const char* lineEnd) {
     take(field, static_cast<std::size_t>(lineEnd - position));
   } else {
     startPieces(field);
-    for (; lineEnd == limit; lineEnd = endOfLine(position)) {
+    for (; lineEnd == limit; lineEnd = endOfLine()) {
       if (!takePiece(field, rest()) || !refill()) return false;
     }
     if (!takePiece(field, static_cast<std::size_t>(lineEnd - position))) return false;

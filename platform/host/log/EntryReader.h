@@ -45,8 +45,6 @@ struct LogEntry {
 
   /// One value for each field; a field that the entry does not have is one without data.
   using Values = std::array<std::string_view, static_cast<std::size_t>(Field::none)>;
-  const Values& all() const { return values; }
-  Values& all() { return values; }
 
  private:
   Values values;
@@ -116,12 +114,13 @@ class EntryReader {
   void endPieces(Field field);
   void leaveBuffer();
 
+  const char* endOfLine() const;
   Field wanted(std::string_view name);
   std::size_t rest() const { return static_cast<std::size_t>(limit - position); }
   std::string& copy(Field field) { return copies[static_cast<std::size_t>(field)]; }
 
   ByteSource& source;
-  std::vector<char> buffer;    ///< of kBuffer bytes and a margin
+  std::vector<char> buffer;    ///< of kBuffer bytes, and a newline after those that it holds
   const char* position;        ///< of the first byte not yet read, in the buffer
   const char* limit;           ///< the end of what the buffer holds
   std::uint64_t consumed = 0;  ///< bytes of the log before the buffer
