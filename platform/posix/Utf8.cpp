@@ -1,8 +1,6 @@
 #include "platform/posix/Utf8.h"
 
 #include <array>
-#include <cstdint>
-#include <cstring>
 
 namespace posix {
 namespace {
@@ -41,27 +39,16 @@ Sequence firstSequence(std::string_view text) {
   return {length, true};
 }
 
-/// Whether `text` is ASCII throughout: eight bytes at a time, the last eight perhaps twice.
+/// Whether `text` is ASCII throughout. Without an exit from the loop, which makes it many bytes at
+/// a time.
 bool isAscii(std::string_view text) {
-  constexpr std::uint64_t kHighBits = 0x8080808080808080U;
-  std::uint64_t seen = 0;
-  if (text.empty()) return true;
-  if (text.size() < sizeof seen) {
-    std::memcpy(&seen, text.data(), text.size());
-    return (seen & kHighBits) == 0;
-  }
-  std::uint64_t word = 0;
-  for (std::size_t i = 0; i + sizeof word < text.size(); i += sizeof word) {
-    std::memcpy(&word, text.data() + i, sizeof word);
-    seen |= word;
-  }
-  std::memcpy(&word, text.data() + text.size() - sizeof word, sizeof word);
-  return ((seen | word) & kHighBits) == 0;
+  unsigned char seen = 0;
+  for (const char byte : text) seen |= static_cast<unsigned char>(byte);
+  return seen < 0x80;
 }
 
 /// The length of the longest well-formed beginning of `text`.
 std::size_t wellFormedLength(std::string_view text) {
-  if (isAscii(text)) return text.size();
   std::size_t length = 0;
   while (length < text.size()) {
     const Sequence sequence = firstSequence(text.substr(length));
@@ -73,17 +60,18 @@ std::size_t wellFormedLength(std::string_view text) {
 
 }  // namespace
 
-bool isUtf8(std::string_view text) { return wellFormedLength(text) == text.size(); }
+bool isUtf8(std::string_view text) {
+  return isAscii(text) || wellFormedLength(text) == text.size();
+}
 
 std::string_view asUtf8(std::string_view text, std::string& storage) {
-  std::size_t good = wellFormedLength(text);
-  if (good == text.size()) return text;
+  if (isUtf8(text)) return text;
   storage.clear();
   while (!text.empty()) {
+    const std::size_t good = wellFormedLength(text);
     storage.append(text.substr(0, good));
     text.remove_prefix(good);
     if (!text.empty()) appendUtf8(storage, takeCodePoint(text));
-    good = wellFormedLength(text);
   }
   return storage;
 }
