@@ -1,84 +1,34 @@
 #include <array>
 #include <chrono>
 #include <cmath>
-#include <cstdlib>
 #include <ctime>
 #include <limits>
-#include <string_view>
 
 #include "platform/oslog_store.h"
 
 namespace {
 
 constexpr std::int64_t kMicrosecondsASecond = 1'000'000;
-constexpr std::int64_t kSecondsADay = 86'400;
-
-constexpr std::int64_t floorDivide(std::int64_t value, std::int64_t divisor) {
-  return value / divisor - (value % divisor < 0 ? 1 : 0);
-}
 
 std::int64_t wholeSeconds(OSLogDate date) {
-  return floorDivide(date.microsecondsSince1970(), kMicrosecondsASecond);
+  const std::chrono::microseconds since(date.microsecondsSince1970());
+  return std::chrono::floor<std::chrono::seconds>(since).count();
 }
 
-struct Day {
-  std::int64_t year;
-  unsigned month;
-  unsigned day;
-};
-
-/// The day of the Gregorian calendar, carried back before it was in use. `std::chrono` knows years
-/// of 16 bits alone, and a date holds more.
-constexpr Day civilDay(std::int64_t daysSince1970) {
-  constexpr std::int64_t kDaysOf400Years = 146'097;
-  constexpr std::int64_t kDaysFromMarchOfYear0 = 719'468;
-  // Years begin in March here, so that the leap day is a year's last.
-  const std::int64_t days = daysSince1970 + kDaysFromMarchOfYear0;
-  const std::int64_t era = floorDivide(days, kDaysOf400Years);
-  const auto dayOfEra = static_cast<unsigned>(days - era * kDaysOf400Years);
-  const unsigned yearOfEra =
-      (dayOfEra - dayOfEra / 1'460 + dayOfEra / 36'524 - dayOfEra / 146'096) / 365;
-  const unsigned dayOfYear = dayOfEra - (365 * yearOfEra + yearOfEra / 4 - yearOfEra / 100);
-  const unsigned month = (5 * dayOfYear + 2) / 153;
-  const std::int64_t year = era * 400 + yearOfEra + (month >= 10 ? 1 : 0);
-  return {year, month < 10 ? month + 3 : month - 9, dayOfYear - (153 * month + 2) / 5 + 1};
-}
-
-/// Writes `number` in at least `digits` digits before `end`, and returns where it starts.
-char* writeBefore(char* end, std::uint64_t number, int digits) {
-  for (; digits > 0 || number != 0; --digits, number /= 10) {
-    *--end = static_cast<char>('0' + number % 10);
-  }
-  return end;
-}
-
-/// The text of a date, at the end of the room for the longest year that a date can have.
+/// The text of a date to the second, with room for the longest year that a date can have.
 struct DateText {
-  std::array<char, sizeof "-000000-MM-DD HH:MM:SS +0000" - 1> text{};
-  std::size_t start = 0;
+  std::array<char, sizeof "-290308-MM-DD HH:MM:SS +0000"> text{};
+  std::size_t length = 0;
 };
 
-DateText describe(std::int64_t secondsSince1970) {
-  constexpr std::string_view kZone = " +0000";
-  const std::int64_t days = floorDivide(secondsSince1970, kSecondsADay);
-  const auto ofDay = static_cast<std::uint64_t>(secondsSince1970 - days * kSecondsADay);
-  const Day day = civilDay(days);
+DateText describe(std::int64_t seconds) {
+  const auto moment = static_cast<std::time_t>(seconds);
+  std::tm utc{};
   DateText date;
-  char* start = date.text.data() + date.text.size() - kZone.size();
-  kZone.copy(start, kZone.size());
-  start = writeBefore(start, ofDay % 60, 2);
-  *--start = ':';
-  start = writeBefore(start, ofDay / 60 % 60, 2);
-  *--start = ':';
-  start = writeBefore(start, ofDay / 3'600, 2);
-  *--start = ' ';
-  start = writeBefore(start, day.day, 2);
-  *--start = '-';
-  start = writeBefore(start, day.month, 2);
-  *--start = '-';
-  start = writeBefore(start, static_cast<std::uint64_t>(std::abs(day.year)), 4);
-  if (day.year < 0) *--start = '-';
-  date.start = static_cast<std::size_t>(start - date.text.data());
+  if (::gmtime_r(&moment, &utc) != nullptr) {
+    date.length =
+        std::strftime(date.text.data(), date.text.size(), "%Y-%m-%d %H:%M:%S +0000", &utc);
+  }
   return date;
 }
 
@@ -120,21 +70,18 @@ void OSLogDate::appendDescription(std::string& text) const {
     known = describe(seconds);
     knownSeconds = seconds;
   }
-  text.append(known.text.data() + known.start, known.text.size() - known.start);
+  text.append(known.text.data(), known.length);
 }
 
 std::int32_t OSLogTimeZone::secondsFromGMT(OSLogDate date) const {
   if (fixed) return *fixed;
-  // Asking the C library takes its lock and longer than all the rest of an event. Since 1970 no
-  // zone has changed its offset at anything finer than half a minute.
-  constexpr std::int64_t kSpan = 30;
+  // Asking the C library takes its lock, and longer than all the rest of an event.
   struct Known {
-    std::int64_t span;
+    std::int64_t seconds;
     std::int32_t offset;
   };
   thread_local Known known{std::numeric_limits<std::int64_t>::max(), 0};
   const std::int64_t seconds = wholeSeconds(date);
-  const std::int64_t span = floorDivide(seconds, kSpan);
-  if (span != known.span) known = {span, localOffset(seconds)};
+  if (seconds != known.seconds) known = {seconds, localOffset(seconds)};
   return known.offset;
 }
