@@ -49,18 +49,3 @@ std::int32_t mode() { return host::device().compression; }
 bool supported() { return host::device().compressionSupported; }
 
 }  // namespace defaults::compression
-
-namespace util {
-namespace {
-
-char lowered(char letter) {
-  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter - 'A' + 'a') : letter;
-}
-
-}  // namespace
-
-bool equal_nocase(std::string_view left, std::string_view right) {
-  return std::ranges::equal(left, right, {}, lowered, lowered);
-}
-
-}  // namespace util

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 
+#include "platform/posix/Ascii.h"
 #include "platform/posix/Utf8.h"
 
 namespace host {
@@ -47,10 +48,6 @@ constexpr char32_t kLastMark = 0x36F;
 
 constexpr bool isAscii(char32_t code) { return code < 0x80; }
 
-constexpr char smallAscii(char letter) {
-  return letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter + ('a' - 'A')) : letter;
-}
-
 /// True when `letters`, which begin with those of `first`, have one for `code`.
 constexpr bool covers(std::u16string_view letters, char32_t first, char32_t code) {
   return code >= first && code - first < letters.size();
@@ -64,7 +61,7 @@ static_assert(covers(kExtendedAdditional, kAdditionalFirst, 0x1EFF));
 static_assert(!covers(kExtendedAdditional, kAdditionalFirst, 0x1F00));
 
 char32_t baseLetter(char32_t code) {
-  if (isAscii(code)) return static_cast<unsigned char>(smallAscii(static_cast<char>(code)));
+  if (isAscii(code)) return static_cast<unsigned char>(posix::lowered(static_cast<char>(code)));
   if (covers(kLatin1ToExtendedB, kLatin1First, code)) {
     return kLatin1ToExtendedB[code - kLatin1First];
   }
@@ -92,7 +89,7 @@ bool FoldedText::isIn(std::string_view text) const {
   const auto ascii = [](char byte) { return isAscii(static_cast<unsigned char>(byte)); };
   if (!std::ranges::all_of(text, ascii)) return fold(text).find(folded) != std::string::npos;
   // Nearly every path: compared in place.
-  const auto same = [](char theirs, char ours) { return smallAscii(theirs) == ours; };
+  const auto same = [](char theirs, char ours) { return posix::lowered(theirs) == ours; };
   return folded.empty() ||
          std::search(text.begin(), text.end(), folded.begin(), folded.end(), same) != text.end();
 }
