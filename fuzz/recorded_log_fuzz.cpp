@@ -1,15 +1,18 @@
-// Any bytes as a recorded log: read in pieces of a size that the first byte gives, with all that
-// can be asked of each event. What the reader says must not depend on the pieces.
+// A recorded log that is built out of parts, as the input says, or any bytes as one: read in pieces
+// of a size that the first byte gives, with all that can be asked of each event. What the reader
+// says must not depend on the pieces.
 
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
+#include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 
-#include "platform/host/log/EntryReader.h"
 #include "platform/host/log/EventFilter.h"
 #include "platform/host/log/LogEvent.h"
+#include "platform/host/log/RecordedLogReader.h"
 #include "platform/posix/Utf8.h"
 
 namespace {
@@ -20,10 +23,10 @@ class Pieces final : public host::ByteSource {
  public:
   Pieces(std::string_view bytes, std::size_t most) : rest(bytes), piece(most) {}
 
-  std::int64_t read(char* buffer, std::size_t size) override {
+  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
     const std::size_t count = rest.copy(buffer, std::min(size, piece));
     rest.remove_prefix(count);
-    return static_cast<std::int64_t>(count);
+    return count;
   }
 
  private:
@@ -40,39 +43,94 @@ void add(std::string& told, std::string_view text) {
   told.append(text).append("|");
 }
 
+void addAll(std::string& told, const host::LogEvent& event, const host::EventFilter& filter) {
+  add(told, event.process());
+  add(told, event.sender());
+  add(told, event.subsystem());
+  add(told, event.category());
+  add(told, event.composedMessage());
+  add(told, event.senderImagePath());
+  event.date().appendDescription(told);
+  told += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
+  told += std::to_string(event.processIdentifier());
+  told += std::to_string(event.timeZone().secondsFromGMT(event.date()));
+  told += filter.passes(event) ? '+' : '-';
+}
+
 /// All that the log says.
 std::string read(std::string_view log, std::size_t piece, const host::EventFilter& filter) {
-  Pieces source(log, piece);
-  EntryReader reader(source);
+  host::RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
   const host::LogEvent event(reader.entry());
   std::string told;
-  EntryReader::Result result = reader.next();
-  for (; result == EntryReader::Result::entry; result = reader.next()) {
-    add(told, event.process());
-    add(told, event.sender());
-    add(told, event.subsystem());
-    add(told, event.category());
-    add(told, event.composedMessage());
-    add(told, event.senderImagePath());
-    event.date().appendDescription(told);
-    told += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
-    told += std::to_string(event.processIdentifier());
-    told += std::to_string(event.timeZone().secondsFromGMT(event.date()));
-    told += filter.passes(event) ? '+' : '-';
+  try {
+    while (reader.next() == EntryReader::Result::entry) addAll(told, event, filter);
+  } catch (const host::DamagedLog& damage) {
+    told += damage.what();
   }
-  require(result == EntryReader::Result::end || result == EntryReader::Result::damaged);
-  require(reader.next() == result);
-  require(reader.damage().offset <= log.size());
-  return told + reader.damage().what + std::to_string(reader.damage().offset);
+  return told;
+}
+
+/// A run of one byte, so long that it and what surrounds it end near the end of the buffer.
+std::string longRun(unsigned char seed) {
+  const std::size_t size = host::RecordedLogReader::kBuffer - 64 + seed % 128;
+  return std::string(size, seed < 128 ? 'v' : '\xE4');
+}
+
+/// Appends a field with its length in front.
+void addBinary(std::string& log, std::string_view name, std::string_view value) {
+  log.append(name) += '\n';
+  for (unsigned i = 0; i < 8; ++i) log += static_cast<char>(std::uint64_t{value.size()} >> (8 * i));
+  log.append(value) += '\n';
+}
+
+/// A log of whole fields and entries: each two bytes of `recipe` are a part and its seed. At most
+/// `mostLong` parts are long, so that fields and entries lie across the end of the buffer.
+std::string build(std::string_view recipe, int mostLong) {
+  std::string log;
+  int longOnes = 0;
+  for (; recipe.size() >= 2; recipe.remove_prefix(2)) {
+    const auto seed = static_cast<unsigned char>(recipe[1]);
+    const std::string shortRun(seed, static_cast<char>(seed));
+    const std::string run = recipe[0] % 2 != 0 && longOnes++ < mostLong ? longRun(seed) : "s";
+    switch (static_cast<unsigned char>(recipe[0]) / 2 % 8) {
+      case 0:
+        log += "__REALTIME_TIMESTAMP=17000000" + std::to_string(seed) + "\n";
+        break;
+      case 1:
+        log += "MESSAGE=" + run + "\n";
+        break;
+      case 2:
+        log += "_EXE=/usr/" + run + "\n";
+        break;
+      case 3:
+        addBinary(log, "MESSAGE", run);
+        break;
+      case 4:
+        addBinary(log, "UNWANTED", shortRun + run);
+        break;
+      case 5:
+        log += "_COMM=sshd\\" + std::to_string(seed) + "\n";
+        break;
+      case 6:
+        log += "UNWANTED=" + run + "\n";
+        break;
+      default:
+        log += "\n";
+    }
+  }
+  return log;
 }
 
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
   if (size == 0) return 0;
-  const std::string_view log(reinterpret_cast<const char*>(data) + 1, size - 1);
+  const std::string_view rest(reinterpret_cast<const char*>(data) + 1, size - 1);
+  const bool built = data[0] % 2 != 0;
+  const std::string log = built ? build(rest, data[0] % 4 == 3 ? 2 : 0) : std::string(rest);
   const host::EventFilter filter(
       {{{"process == %@", "sshd"}, {"senderImagePath CONTAINS[cd] %@", "Modemcoré"}}});
-  require(read(log, std::size_t{data[0]} + 1, filter) == read(log, size, filter));
+  const std::size_t piece = built ? std::size_t{data[0]} * 1'009 : std::size_t{data[0]} / 2 + 1;
+  require(read(log, piece, filter) == read(log, log.size() + 1, filter));
   return 0;
 }

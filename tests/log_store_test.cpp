@@ -1,6 +1,6 @@
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cmath>
@@ -9,25 +9,29 @@
 #include <fstream>
 #include <limits>
 #include <map>
+#include <new>
+#include <random>
 #include <stdexcept>
 #include <thread>
 
-#include "platform/host/ProcessName.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/log/EntryReader.h"
 #include "platform/host/log/EventFilter.h"
 #include "platform/host/log/FoldedText.h"
 #include "platform/host/log/LogEvent.h"
-#include "platform/host/log/LogSource.h"
+#include "platform/host/log/RecordedLogReader.h"
 #include "platform/host/log/StreamEnd.h"
 #include "platform/oslog_store.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
+#include "platform/posix/files.h"
+#include "platform/system.h"
 #include "tests/Program.h"
 #include "tests/Table.h"
 
 using namespace std::chrono_literals;
 using namespace std::string_literals;
 using host::EntryReader;
+using host::RecordedLogReader;
 using Texts = std::vector<std::string>;
 
 namespace {
@@ -48,10 +52,10 @@ std::string binary(const std::string& name, const std::string& value) {
 
 struct Pieces final : host::ByteSource {
   Pieces(std::string_view bytes, std::size_t most) : rest(bytes), piece(most) {}
-  std::int64_t read(char* buffer, std::size_t size) override {
+  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
     const std::size_t count = rest.copy(buffer, std::min(size, piece));
     rest.remove_prefix(count);
-    return static_cast<std::int64_t>(count);
+    return count;
   }
   std::string_view rest;
   std::size_t piece;
@@ -59,14 +63,17 @@ struct Pieces final : host::ByteSource {
 
 /// The messages of a log, and behind them how it ends.
 Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
-  Pieces source(log, piece);
-  EntryReader reader(source);
+  RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
   Texts seen;
-  while (reader.next() == EntryReader::Result::entry) {
-    seen.emplace_back(reader.entry()[host::Field::message]);
+  try {
+    while (reader.next() == EntryReader::Result::entry) {
+      seen.emplace_back(reader.entry()[host::Field::message]);
+    }
+    seen.emplace_back("end");
+  } catch (const host::DamagedLog& damage) {
+    const std::string text = damage.what();
+    seen.push_back(text.substr(text.find(": ") + 2));
   }
-  const bool whole = reader.next() == EntryReader::Result::end;
-  seen.emplace_back(whole ? "end" : reader.damage().what);
   return seen;
 }
 
@@ -86,8 +93,7 @@ std::string summary(const OSLogEventProxy& event) {
 TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
   for (const auto& row : readTable("event-fields", 2)) {
     const std::string log = kDate + row[0] + '\n';
-    Pieces source(log, 1);
-    EntryReader reader(source);
+    RecordedLogReader reader(std::make_unique<Pieces>(log, 1));
     ASSERT_EQ(reader.next(), EntryReader::Result::entry);
     EXPECT_EQ(summary(host::LogEvent(reader.entry())), row[1]) << row[0];
   }
@@ -100,7 +106,7 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
                                              {'F', binary("MESSAGE", kForged)},
                                              {'O', binary("OTHER", kForged)},
                                              {'S', binary("MESSAGE", "xyz", 2)},
-                                             {'C', binary("X", "", EntryReader::kMaxField + 1)},
+                                             {'C', binary("MESSAGE", "", host::kMaxField + 1)},
                                              {'L', binary("X", "", ~0ULL)}};
   for (const auto& row : readTable("damage", 2)) {
     std::string log;
@@ -137,14 +143,16 @@ TEST(RecordedLog, LongFieldsAreWholeUpToTheCap) {
     return kDate + binary(name, value) + binary("X", value) + "\n" + kDate + name + "=" + value +
            "\nX=" + value + "\n\n";
   };
-  std::vector<std::size_t> sizes = {10'000'000, EntryReader::kMaxField};
-  for (std::size_t off = 0; off < 120; ++off) sizes.push_back(EntryReader::kBuffer - off);
+  std::vector<std::size_t> sizes = {10'000'000, host::kMaxField};
+  for (std::size_t off = 0; off < 120; ++off) sizes.push_back(RecordedLogReader::kBuffer - off);
   for (const std::size_t size : sizes) {
     const std::string value(size, 'v');
     ASSERT_TRUE(readAll(logOf(value)) == (Texts{value, value, "end"})) << size;
   }
-  const std::string most(EntryReader::kMaxField, 'v');
-  EXPECT_EQ(readAll(kDate + "X=" + most + "v\n\n"), Texts{"a field is too long"});
+  const std::string most(host::kMaxField, 'v');
+  EXPECT_EQ(readAll(kDate + "X=" + most + "v\n" + binary("Y", most + "v") + "\n"),
+            (Texts{"", "end"}));
+  EXPECT_EQ(readAll(kDate + "MESSAGE=" + most + "v\n\n"), Texts{"a field is too long"});
   EXPECT_EQ(readAll(kDate + "_EXE=" + most + "\n_COMM=" + most + "\nMESSAGE=" + most + "\n\n"),
             Texts{"an entry is too long"});
 }
@@ -199,24 +207,13 @@ struct Delivered {
 
 class LogStore : public testing::Test {
  protected:
-  ~LogStore() override {
-    host::device() = device;
-    setenv("PATH", path.c_str(), 1);
-  }
+  ~LogStore() override { host::device() = device; }
 
   std::string write(const std::string& name, const std::string& text, mode_t mode = 0644) {
     std::string file = scratch.path(name);
     writeFile(file, text);
     chmod(file.c_str(), mode);
     return file;
-  }
-
-  /// Puts a journalctl on the PATH that answers the first question and then runs `script`.
-  void installJournalctl(const std::string& script) {
-    write("journalctl",
-          "#!/bin/sh\ncd " + folder + "\ncase \"$*\" in *lines=0*) exit 0;; esac\n" + script + "\n",
-          0755);
-    setenv("PATH", (folder + ":/usr/bin:/bin").c_str(), 1);
   }
 
   static std::string prepareError(const std::string& log) {
@@ -238,14 +235,15 @@ class LogStore : public testing::Test {
     return made;
   }
 
-  /// Runs a stream to its end; it is invalidated by its event number `stopAt`, if there is one.
-  static Delivered run(const std::shared_ptr<OSLogEventStream>& from, std::size_t stopAt = 0,
-                       OSLogDate date = OSLogDate(0)) {
+  /// Runs a stream to its end; `onEvent` is called with the number of each event.
+  template <class OnEvent>
+  static Delivered run(const std::shared_ptr<OSLogEventStream>& from, OSLogDate date,
+                       OnEvent onEvent) {
     Delivered delivered;
     const auto ended = dispatch::group::create();
-    from->setEventHandler([&, weak = std::weak_ptr(from)](const OSLogEventProxy& event) {
+    from->setEventHandler([&](const OSLogEventProxy& event) {
       delivered.events.push_back(summary(event));
-      if (delivered.events.size() == stopAt) weak.lock()->invalidate();
+      onEvent(delivered.events.size());
     });
     from->setInvalidationHandler(
         [&delivered, member = dispatch::membership(ended)](unsigned long reason, const auto&) {
@@ -254,13 +252,19 @@ class LogStore : public testing::Test {
     from->activateStreamFromDate(date);
     from->setInvalidationHandler(nullptr);
     EXPECT_TRUE(ended.wait(60s));
-    EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), -1) << "a process has been left";
     return delivered;
+  }
+
+  /// Likewise; it is invalidated by its event number `stopAt`, if there is one.
+  static Delivered run(const std::shared_ptr<OSLogEventStream>& from, std::size_t stopAt = 0,
+                       OSLogDate date = OSLogDate(0)) {
+    return run(from, date, [&](std::size_t number) {
+      if (number == stopAt) from->invalidate();
+    });
   }
 
   const ScratchFolder scratch;
   const std::string folder = std::filesystem::path(scratch.path("file")).parent_path();
-  const std::string path = getenv("PATH");
   const host::Profile device = host::device();
 };
 
@@ -300,6 +304,41 @@ TEST_F(LogStore, InvalidateInterruptsAReadThatIsBlocked) {
   EXPECT_EQ(run(blocked, 1).reason, host::kStreamInvalidated);
 }
 
+TEST_F(LogStore, TooLittleMemoryEndsTheStreamAndNotTheProcess) {
+  const std::string pipe = folder + "/pipe";
+  ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+  const auto failing = stream(pipe);
+  std::ofstream writer(pipe);  // which the reading thread then waits for
+  writer << kDate << "\n" << std::flush;
+  const auto fail = [](std::size_t) { throw std::bad_alloc(); };
+  EXPECT_EQ(run(failing, OSLogDate(0), fail).reason, host::kStreamUnreadable);
+}
+
+TEST_F(LogStore, NothingThatIsReadIsAnOutput) {
+  const std::string sub = folder + "/01234567-89AB-cdef-0123-456789abcdef";
+  const ScratchFolder elsewhere;
+  std::filesystem::create_directories(sub + "/deeper");
+  const std::string file = sub + "/x.journal";
+  writeFile(file, "kept");
+  std::filesystem::create_hard_link(file, elsewhere.path("same"));
+  std::filesystem::create_symlink(file, elsewhere.path("link"));
+  std::filesystem::create_symlink(folder + "/new", elsewhere.path("dangling"));
+  const posix::Descriptor opened(open(file.c_str(), O_RDONLY));
+  const std::string byNumber = "/proc/self/fd/" + std::to_string(opened.get());
+  host::device().log = folder;
+  for (const auto& path : {file, folder + "/new", sub + "/../new", byNumber, elsewhere.path("same"),
+                           elsewhere.path("link"), elsewhere.path("dangling")}) {
+    platform::createEmptyFile(path);
+    EXPECT_EQ(platform::FileHandle::openForAppending(path), nullptr) << path;
+    EXPECT_EQ(readFile(file), "kept") << path;
+  }
+  EXPECT_FALSE(posix::isReadByDevice(elsewhere.path("new")));
+  EXPECT_FALSE(posix::isReadByDevice(sub + "/deeper/new"));
+  host::device().log = file;
+  EXPECT_TRUE(posix::isReadByDevice(elsewhere.path("link")));
+  EXPECT_FALSE(posix::isReadByDevice(folder + "/new"));
+}
+
 TEST_F(LogStore, SaysWhyItCannotBePrepared) {
   host::device().logPrepareError = "Out of order";
   EXPECT_EQ(prepareError("sample"), "Out of order");
@@ -316,86 +355,98 @@ TEST_F(LogStore, SaysWhyItCannotBePrepared) {
                                       "root or as a member of the group systemd-journal");
   ASSERT_TRUE(!isRoot || seteuid(0) == 0);
   chmod(file.c_str(), 0600);
-  setenv("PATH", folder.c_str(), 1);
-  EXPECT_EQ(prepareError(folder), "Cannot read the journal: journalctl is not installed");
-  write("journalctl", "#!/bin/sh\necho Oh no >&2\necho more >&2\nexit 1\n", 0755);
-  EXPECT_EQ(prepareError(folder), "journalctl failed: Oh no");
-  write("journalctl", "#!/bin/sh\nexec /bin/sleep 1000\n", 0755);
-  EXPECT_THROW(host::prepareLog(folder, 20ms), std::runtime_error);
 }
 
-TEST_F(LogStore, AJournalctlThatFailsIsNoEndOfTheLog) {
-  write("x.journal", "");
-  write("log", kDate + "_COMM=a\n\n");
-  for (const auto& row : readTable("journalctl", 3)) {
-    installJournalctl(row[0]);
-    const Delivered delivered = run(stream(folder), std::stoul(row[2]));
-    EXPECT_EQ(delivered.events.size(), 1) << row[0];
-    EXPECT_EQ(delivered.reason, std::stoul(row[1])) << row[0];
+/// Journal files, made of recorded logs by systemd's own program.
+class Journal : public LogStore {
+ protected:
+  void SetUp() override {
+    if (access(kWriter, X_OK) != 0) GTEST_SKIP() << "systemd-journal-remote is not installed";
+    if (prepareError(makeFile("probe", "")).find("built without") != std::string::npos) {
+      GTEST_SKIP() << "built without libsystemd";
+    }
+    std::filesystem::remove(folder + "/probe.journal");
   }
-}
 
-TEST_F(LogStore, JournalctlDoesNotOutliveTheProcess) {
-  write("x.journal", "");
-  installJournalctl("echo $$ > id; mv id pid; exec sleep 1000");
-  const auto exitWhileItRuns = [this] {
-    stream(folder)->activateStreamFromDate(OSLogDate(0));
-    while (access((folder + "/pid").c_str(), F_OK) != 0) std::this_thread::yield();
-    std::exit(3);
-  };
-  EXPECT_EXIT(exitWhileItRuns(), testing::ExitedWithCode(3), "");
-  const auto status = "/proc/" + std::to_string(std::stoi(readFile(folder + "/pid"))) + "/stat";
-  const auto isGone = [&status] {  // or waits for the system to reap it
-    const auto text = readFile(status);
-    return text.empty() || text.find(") Z ") != std::string::npos;
-  };
-  while (!isGone()) std::this_thread::yield();
-}
-
-TEST_F(LogStore, JournalctlIsAskedForLittleMoreThanIsWanted) {
-  write("x.journal", "");
-  installJournalctl("for word; do echo \"$word\"; done > words");
-  const std::string common = "--quiet\n--no-pager\n--output=export\n--directory=" + folder + "\n";
-  const auto check = [&](OSLogOrPredicate filter, std::int64_t from, const std::string& more) {
-    const auto asked = stream(folder);
-    asked->setFilterPredicate(std::move(filter));
-    run(asked, 0, OSLogDate(from));
-    EXPECT_EQ(readFile(folder + "/words"), common + more);
-  };
-  check({{{"process == %@", "a"}, {"process == %@", "a-long-process-name"}}}, 1'999'999,
-        "--since=@1\n_COMM=a\n_COMM=a-long-process-\n+\nSYSLOG_IDENTIFIER=a\n"
-        "SYSLOG_IDENTIFIER=a-long-process-name\n");
-  check({{{"process == %@", "a"}, {"senderImagePath CONTAINS[cd] %@", "b"}}}, 0, "");
-  check({{{"process == %@", "\uFFFD"}}}, -5'000'000, "");
-}
-
-TEST_F(LogStore, RealJournalFilesGiveWhatTheyWereMadeFrom) {
-  const std::string writer = "/lib/systemd/systemd-journal-remote";
-  if (access(writer.c_str(), X_OK) != 0 || system("journalctl --version >/dev/null 2>&1") != 0) {
-    GTEST_SKIP() << "no systemd-journal-remote or journalctl";
+  std::string logOf(int entries) const {
+    const Texts kinds = {
+        "_COMM=a-long-process-\n_EXE=/x/a-long-process-name\n",
+        "_COMM=pr\\303\\266zess-\\303\\274n\\303\\257c\n_EXE=/x/prözess-ünïcode\n",
+        "_COMM=with blank\n_EXE=/opt/Mödem Core/x\nSYSLOG_IDENTIFIER=ignored\n",
+        "SYSLOG_IDENTIFIER=only an identifier\nLOG_SENDER_PATH=/lib/Ünit.so\n",
+        "_COMM=\\\"q\\\\\\n\n" + binary("MESSAGE", kForged),
+        "_COMM=huge\nMESSAGE=" + std::string(entries > 1'000 ? 1 : 100'000, 'm') + "\n",
+        "LOG_GMTOFF=3600\n"};
+    std::string log;
+    for (int i = 0; i < entries; ++i) {
+      const std::string number = std::to_string(1'000'000 + i);
+      log += "__REALTIME_TIMESTAMP=1700000000" + number.substr(1) +
+             "\n__MONOTONIC_TIMESTAMP=" + number + "\n_BOOT_ID=0123456789abcdef0123456789abcdef\n" +
+             kinds[static_cast<std::size_t>(i) % kinds.size()] + "_PID=" + number + "\n\n";
+    }
+    return log;
   }
-  const auto entryOf = [](int i) {
-    const std::string number = std::to_string(10 + i);
-    return "__REALTIME_TIMESTAMP=17000000" + number + "000000\n__MONOTONIC_TIMESTAMP=" + number +
-           "\n_BOOT_ID=0123456789abcdef0123456789abcdef\n_PID=" + number +
-           (i % 2 == 0 ? "\n_COMM=a-long-process-\n_EXE=/x/a-long-process-name" : "\n_COMM=b") +
-           (i % 3 == 0 ? "\nSYSLOG_IDENTIFIER=a-long-process-\n" : "\n") +
-           binary("MESSAGE", "line\n\nMESSAGE=" + number) + "\n";
-  };
-  std::string text;
-  for (int i = 0; i < 60; ++i) text += entryOf(i);
-  const std::string log = write("log", text);
-  const std::string make = writer + " -o " + folder + "/x.journal " + log + " 2>/dev/null";
-  ASSERT_EQ(system(make.c_str()), 0);
-  for (const char* name : {"", "a-long-process-", "a-long-process-name", "b", "none"}) {
-    const auto deliver = [name](const auto& from) {
-      if (*name != 0) from->setFilterPredicate({{{"process == %@", name}}});
-      return run(from, 0, OSLogDate(1'700'000'020'000'000));
+
+  std::string makeFile(const std::string& name, const std::string& log) {
+    const std::string file = folder + "/" + name + ".journal";
+    const std::string make =
+        std::string(kWriter) + " -o " + file + " " + write("log", log) + " >/dev/null 2>&1";
+    EXPECT_EQ(system(make.c_str()), 0);
+    return file;
+  }
+
+  static constexpr const char* kWriter = "/lib/systemd/systemd-journal-remote";
+};
+
+TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
+  const std::string id = folder + "/0123456789ABCDEF0123456789abcdef";
+  std::filesystem::create_directory(id);
+  const std::string file = makeFile("x", logOf(140));
+  for (const auto& row : readTable("journal-filters", 3)) {
+    const auto deliver = [&row](const std::string& log) {
+      const auto from = stream(log);
+      OSLogOrPredicate filter;
+      if (!row[0].empty()) filter.terms.push_back({row[0], row[1]});
+      if (!row[0].empty()) from->setFilterPredicate(filter);
+      return run(from, 0, OSLogDate(1'700'000'000'000'070));
     };
-    const Delivered recorded = deliver(stream(log));
-    const Delivered journal = deliver(stream(folder));
-    EXPECT_EQ(recorded.events, journal.events) << name;
-    EXPECT_EQ(journal.reason, kOSLogEventStreamEndOfLog) << name;
+    const Delivered recorded = deliver(folder + "/log");
+    EXPECT_EQ(recorded.events.size(), std::stoul(row[2])) << row[1];
+    EXPECT_TRUE(recorded.events == deliver(file).events) << row[1];
+    std::filesystem::rename(file, id + "/x.journal");
+    const Delivered journal = deliver(folder);
+    std::filesystem::rename(id + "/x.journal", file);
+    EXPECT_TRUE(recorded.events == journal.events) << row[1];
+    EXPECT_EQ(journal.reason, kOSLogEventStreamEndOfLog) << row[1];
+  }
+  EXPECT_EQ(run(stream(file), 3).reason, host::kStreamInvalidated);
+}
+
+TEST_F(Journal, RefusesAFileThatItCannotRead) {
+  const std::string file = makeFile("x", logOf(10));
+  write("y.journal", "");
+  EXPECT_EQ(prepareError(folder),
+            "Cannot read the journal: " + folder + "/y.journal: No data available");
+  std::filesystem::remove(folder + "/y.journal");
+  const auto late = stream(folder);
+  std::filesystem::resize_file(file, 100);
+  EXPECT_EQ(run(late).reason, host::kStreamUnreadable);
+}
+
+TEST_F(Journal, OutlivesFilesThatAreTruncatedWhileTheyAreRead) {
+  const std::string kept = makeFile("kept", logOf(6'000));
+  const std::string file = write("x.journal", readFile(kept));
+  std::mt19937 random(std::random_device{}());
+  for (int i = 0; i < 20; ++i) {
+    std::filesystem::copy_file(kept, file, std::filesystem::copy_options::overwrite_existing);
+    const std::size_t moment = 1 + random() % 3'000;
+    const std::size_t size = random() % std::filesystem::file_size(kept);
+    const auto truncate = [&](std::size_t number) {
+      if (number == moment) std::filesystem::resize_file(file, size);
+    };
+    const Delivered delivered = run(stream(file), OSLogDate(0), truncate);
+    EXPECT_EQ(delivered.reason, host::kStreamUnreadable) << moment << " " << size;
+    EXPECT_GE(delivered.events.size(), moment);
   }
 }
 

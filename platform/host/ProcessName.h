@@ -1,5 +1,6 @@
 #pragma once
 
+#include <string>
 #include <string_view>
 
 namespace host {
@@ -16,7 +17,9 @@ std::string_view fileName(std::string_view path);
 /// Either may be empty. The result lies in one of the two.
 std::string_view processName(std::string_view comm, std::string_view exePath);
 
-/// What the kernel keeps of the name of a process.
-std::string_view truncatedByKernel(std::string_view name);
+/// The name itself of `escaped`, in which journald has written quotation marks, backslashes and
+/// what is no printing ASCII as in C: two characters, or a backslash and three octal digits. Any
+/// other backslash stands for itself. The result is `escaped` or lies in `storage`.
+std::string_view unescaped(std::string_view escaped, std::string& storage);
 
 }  // namespace host

@@ -20,6 +20,10 @@ class Descriptor {
   }
 
   int get() const noexcept { return number; }
+
+  /// Leaves it open, to whoever owns it now.
+  void release() noexcept { number = -1; }
+
   explicit operator bool() const noexcept { return number >= 0; }
 
  private:

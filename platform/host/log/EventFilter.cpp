@@ -8,7 +8,7 @@ namespace host {
 EventFilter::EventFilter(OSLogOrPredicate predicate) : everything(false) {
   for (OSLogPredicate& term : predicate.terms) {
     if (term.format == "process == %@") {
-      names.push_back(std::move(term.value));
+      names.insert(std::move(term.value));
     } else if (term.format == "senderImagePath CONTAINS[cd] %@") {
       pathParts.emplace_back(term.value);
     } else {
@@ -19,15 +19,10 @@ EventFilter::EventFilter(OSLogOrPredicate predicate) : everything(false) {
 
 bool EventFilter::passes(const LogEvent& event) const {
   if (everything) return true;
-  if (!names.empty() && std::ranges::find(names, event.process()) != names.end()) return true;
+  if (!names.empty() && names.contains(event.process())) return true;
   if (pathParts.empty()) return false;
   const std::string_view path = event.senderImagePath();
   return std::ranges::any_of(pathParts, [path](const FoldedText& part) { return part.isIn(path); });
-}
-
-std::optional<std::vector<std::string>> EventFilter::processes() const {
-  if (everything || !pathParts.empty()) return std::nullopt;
-  return names;
 }
 
 }  // namespace host

@@ -1,6 +1,6 @@
 #pragma once
 
-#include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -22,13 +22,9 @@ class EventFilter {
 
   bool passes(const LogEvent& event) const;
 
-  /// The names of which a process must have one for its events to pass; nothing when other events
-  /// may pass as well.
-  std::optional<std::vector<std::string>> processes() const;
-
  private:
   bool everything = true;
-  std::vector<std::string> names;
+  std::set<std::string, std::less<>> names;
   std::vector<FoldedText> pathParts;
 };
 

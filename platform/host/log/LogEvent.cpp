@@ -80,7 +80,7 @@ std::string_view LogEvent::senderImagePath() const { return utf8(Text::path, pat
 
 std::string_view LogEvent::processBytes() const {
   if (!entry.has(Field::comm)) return entry[Field::syslogIdentifier];
-  return processName(entry[Field::comm], entry[Field::exe]);
+  return processName(unescaped(entry[Field::comm], name), entry[Field::exe]);
 }
 
 std::string_view LogEvent::pathBytes() const {

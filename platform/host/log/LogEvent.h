@@ -5,7 +5,7 @@
 #include <optional>
 #include <string>
 
-#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/LogEntry.h"
 #include "platform/oslog_store.h"
 
 namespace host {
@@ -19,7 +19,7 @@ namespace host {
 /// - type: LOG_TYPE, 1024
 /// - date: the entry's; time zone: LOG_GMTOFF (seconds), this machine's local zone
 /// - thread: TID, _PID, 0; activity: LOG_ACTIVITY, 0; process identifier: _PID, SYSLOG_PID, 0
-/// - process: _COMM (whole, by way of _EXE), SYSLOG_IDENTIFIER
+/// - process: _COMM (without journald's escapes, whole by way of _EXE), SYSLOG_IDENTIFIER
 /// - path of the image that logged: LOG_SENDER_PATH, _EXE; sender: its file name, the process
 /// - subsystem: LOG_SUBSYSTEM, _SYSTEMD_UNIT, _TRANSPORT; category: LOG_CATEGORY,
 ///   SYSLOG_IDENTIFIER
@@ -54,6 +54,7 @@ class LogEvent final : public OSLogEventProxy {
   std::string_view utf8(Text which, std::string_view bytes) const;
 
   const LogEntry& entry;
+  mutable std::string name;  ///< an unescaped one
   mutable std::array<std::string, static_cast<std::size_t>(Text::count)> repaired;
 };
 

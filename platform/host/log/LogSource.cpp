@@ -4,14 +4,16 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <array>
 #include <cerrno>
 #include <stdexcept>
+#include <string_view>
 #include <system_error>
-#include <vector>
 
 #include "platform/host/device/Device.h"
-#include "platform/host/log/Journal.h"
-#include "platform/host/log/JournalProcess.h"
+#include "platform/host/log/JournalFiles.h"
+#include "platform/host/log/JournalReader.h"
+#include "platform/host/log/RecordedLogReader.h"
 #include "platform/host/log/SampleLog.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/files.h"
@@ -19,17 +21,15 @@
 namespace host {
 namespace {
 
-std::string reason(int error) { return std::generic_category().message(error); }
-
 /// The bytes of a text.
 class TextBytes final : public ByteSource {
  public:
   explicit TextBytes(std::string given) : text(std::move(given)) {}
 
-  std::int64_t read(char* buffer, std::size_t size) override {
+  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
     const std::size_t count = text.copy(buffer, size, position);
     position += count;
-    return static_cast<std::int64_t>(count);
+    return count;
   }
 
  private:
@@ -43,17 +43,19 @@ class DescriptorBytes final : public ByteSource {
   DescriptorBytes(int opened, const StopSignal& signal)
       : descriptor(opened), stop(signal), isFile(::lseek(opened, 0, SEEK_CUR) >= 0) {}
 
-  std::int64_t read(char* buffer, std::size_t size) override {
+  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
     while (stop.waitReadable(descriptor)) {
       const ssize_t count =
           isFile ? ::pread(descriptor, buffer, size, offset) : ::read(descriptor, buffer, size);
       if (count >= 0) {
         offset += count;
-        return count;
+        return static_cast<std::size_t>(count);
       }
-      if (errno != EINTR && errno != EAGAIN) return kFailed;
+      if (errno != EINTR && errno != EAGAIN) {
+        throw std::system_error(errno, std::generic_category());
+      }
     }
-    return kStopped;
+    return std::nullopt;
   }
 
  private:
@@ -63,32 +65,12 @@ class DescriptorBytes final : public ByteSource {
   off_t offset = 0;
 };
 
-/// What a journalctl writes, which ends well only if the process does, without a complaint: it
-/// passes over files that it cannot open, and says so on standard error alone.
-class JournalBytes final : public ByteSource {
- public:
-  JournalBytes(const std::vector<std::string>& arguments, const StopSignal& signal)
-      : process(arguments), output(process.output(), signal) {}
-
-  std::int64_t read(char* buffer, std::size_t size) override {
-    const std::int64_t count = output.read(buffer, size);
-    if (count != kEnd) return count;
-    const bool whole = process.succeeded(kTimeToEnd).value_or(false) && process.messages().empty();
-    return whole ? kEnd : kFailed;
-  }
-
- private:
-  static constexpr std::chrono::milliseconds kTimeToEnd = std::chrono::seconds(5);
-
-  JournalProcess process;
-  DescriptorBytes output;
-};
-
 class SampleSource final : public LogSource {
  public:
-  std::unique_ptr<ByteSource> open(OSLogDate, const EventFilter&,
-                                   const StopSignal&) const override {
-    return std::make_unique<TextBytes>(sampleLog(OSLogDate::now()));
+  std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
+                                    const StopSignal&) const override {
+    return std::make_unique<RecordedLogReader>(
+        std::make_unique<TextBytes>(sampleLog(OSLogDate::now())));
   }
 };
 
@@ -96,48 +78,56 @@ class RecordedSource final : public LogSource {
  public:
   explicit RecordedSource(posix::Descriptor opened) : descriptor(std::move(opened)) {}
 
-  std::unique_ptr<ByteSource> open(OSLogDate, const EventFilter&,
-                                   const StopSignal& stop) const override {
-    return std::make_unique<DescriptorBytes>(descriptor.get(), stop);
+  std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
+                                    const StopSignal& stop) const override {
+    return std::make_unique<RecordedLogReader>(
+        std::make_unique<DescriptorBytes>(descriptor.get(), stop));
   }
 
  private:
   posix::Descriptor descriptor;
 };
 
+/// Opens the files when they are read, as the journal then is.
 class JournalSource final : public LogSource {
  public:
-  /// `journalFolder` is empty for the journal of this machine.
-  explicit JournalSource(std::string journalFolder) : folder(std::move(journalFolder)) {}
+  /// As `openJournalFiles`. Throws `std::runtime_error` when not all of it can be read.
+  explicit JournalSource(std::string name) : journal(std::move(name)) {
+    for (const JournalFile& file : openJournalFiles(journal)) checkJournalFile(file);
+  }
 
-  std::unique_ptr<ByteSource> open(OSLogDate from, const EventFilter& filter,
-                                   const StopSignal& stop) const override {
-    return std::make_unique<JournalBytes>(exportArguments(folder, from, filter), stop);
+  std::unique_ptr<EntryReader> open(OSLogDate from, const EventFilter& filter,
+                                    const StopSignal& stop) const override {
+    return readJournal(openJournalFiles(journal), from, filter, stop);
   }
 
  private:
-  std::string folder;
+  std::string journal;
 };
 
-std::shared_ptr<LogSource> prepareJournal(const std::string& folder,
-                                          std::chrono::milliseconds patience) {
-  checkJournalFiles(folder);
-  checkJournalctl(folder, patience);
-  return std::make_shared<JournalSource>(folder);
+/// Whether the file is a journal file: what it begins with, see systemd's description of the
+/// journal file format.
+bool isJournalFile(int descriptor) {
+  constexpr std::string_view kSignature = "LPKSHHRH";
+  std::array<char, kSignature.size()> start{};
+  return ::pread(descriptor, start.data(), start.size(), 0) == static_cast<ssize_t>(start.size()) &&
+         std::string_view(start.data(), start.size()) == kSignature;
 }
 
 }  // namespace
 
-std::shared_ptr<LogSource> prepareLog(const std::string& log, std::chrono::milliseconds patience) {
+std::shared_ptr<LogSource> prepareLog(const std::string& log) {
   if (log == "sample") return std::make_shared<SampleSource>();
-  if (log == "journal") return prepareJournal("", patience);
+  if (log == "journal") return std::make_shared<JournalSource>("");
   // Not to wait here for a pipe's writer: that is for the reading, which can be stopped.
   posix::Descriptor opened(::open(log.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
   struct stat about {};
   if (!opened || ::fstat(opened.get(), &about) != 0) {
-    throw std::runtime_error(log + ": " + reason(errno));
+    throw std::runtime_error(log + ": " + std::generic_category().message(errno));
   }
-  if (S_ISDIR(about.st_mode)) return prepareJournal(log, patience);
+  if (S_ISDIR(about.st_mode) || isJournalFile(opened.get())) {
+    return std::make_shared<JournalSource>(log);
+  }
   return std::make_shared<RecordedSource>(std::move(opened));
 }
 
@@ -145,9 +135,6 @@ std::shared_ptr<LogSource> prepareLog(const std::string& log, std::chrono::milli
 
 bool posix::isReadByDevice(const std::string& path) {
   const host::Profile& device = host::device();
-  struct stat file {};
-  struct stat log {};
-  return device.hasLogPath() && stat(path.c_str(), &file) == 0 &&
-         stat(device.log.c_str(), &log) == 0 && file.st_dev == log.st_dev &&
-         file.st_ino == log.st_ino;
+  if (device.log == "sample") return false;
+  return host::isOfJournal(device.hasLogPath() ? device.log : "", path);
 }

@@ -6,7 +6,7 @@
 namespace host {
 namespace {
 
-constexpr std::size_t kBatchBytes = EntryReader::kBuffer;
+constexpr std::size_t kBatchBytes = std::size_t{256} << 10;
 
 }  // namespace
 
@@ -20,25 +20,12 @@ FinishedEvent::FinishedEvent(const LogEvent& event)
       texts{event.process(), event.sender(), event.subsystem(), event.category(),
             event.composedMessage()} {}
 
-/// Hands over what has been read before it asks for more.
-class ReadAhead::Source final : public ByteSource {
- public:
-  Source(ReadAhead& owner, ByteSource& bytes) : reader(owner), source(bytes) {}
-
-  std::int64_t read(char* buffer, std::size_t size) override {
-    if (!reader.filling.events.empty()) reader.handOver();
-    return source.read(buffer, size);
-  }
-
- private:
-  ReadAhead& reader;
-  ByteSource& source;
-};
-
-ReadAhead::ReadAhead(ByteSource& source, Wanted wanted)
-    : thread([this, &source, wanted = std::move(wanted)] { readLog(source, wanted); }) {}
+ReadAhead::ReadAhead(StopSignal& stop, Open open, Wanted wanted)
+    : stopSignal(stop),
+      thread([this, open = std::move(open), wanted = std::move(wanted)] { run(open, wanted); }) {}
 
 ReadAhead::~ReadAhead() {
+  stopSignal.raise();
   {
     const std::lock_guard lock(mutex);
     abandoned = true;
@@ -49,6 +36,7 @@ ReadAhead::~ReadAhead() {
 
 EntryReader::Result ReadAhead::next() {
   while (given == taken.events.size()) {
+    if (taken.failure) std::rethrow_exception(taken.failure);
     if (taken.after != EntryReader::Result::entry) return taken.after;
     takeOver();
   }
@@ -56,16 +44,25 @@ EntryReader::Result ReadAhead::next() {
   return EntryReader::Result::entry;
 }
 
-void ReadAhead::readLog(ByteSource& source, const Wanted& wanted) {
-  Source handingOver(*this, source);
-  EntryReader reader(handingOver);
+void ReadAhead::run(const Open& open, const Wanted& wanted) {
+  try {
+    filling.after = readLog(*open(), wanted);
+  } catch (...) {
+    filling.failure = std::current_exception();
+  }
+  handOver();
+}
+
+EntryReader::Result ReadAhead::readLog(EntryReader& reader, const Wanted& wanted) {
+  reader.callBeforeWaiting([this] {
+    if (!filling.events.empty()) handOver();
+  });
   const LogEvent event(reader.entry());
   EntryReader::Result result = reader.next();
   for (; result == EntryReader::Result::entry; result = reader.next()) {
     if (wanted(event)) add(event);
   }
-  filling.after = result;
-  handOver();
+  return result;
 }
 
 void ReadAhead::add(const LogEvent& event) {

@@ -2,19 +2,25 @@
 
 #include <array>
 #include <condition_variable>
+#include <exception>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <thread>
 #include <vector>
 
-#include "platform/host/log/ByteSource.h"
 #include "platform/host/log/EntryReader.h"
 #include "platform/host/log/LogEvent.h"
+#include "platform/host/log/StopSignal.h"
 
 namespace host {
 
-/// An event with all its parts made out, apart from the entry that it came from. What its texts
+/// An event with all its parts worked out, apart from the entry that it came from. What its texts
 /// refer to belongs to whoever made it.
+///
+/// An event takes three forms: a `LogEntry` is the fields as the reader has them; a `LogEvent` is
+/// a view of one, which works out a part when it is asked, and of most entries a filter asks but
+/// one or two; a `FinishedEvent` is what goes over to another thread.
 class FinishedEvent final : public OSLogEventProxy {
  public:
   explicit FinishedEvent(const LogEvent& event);
@@ -44,47 +50,55 @@ class FinishedEvent final : public OSLogEventProxy {
   Texts texts;
 };
 
-/// Reads a log and makes out its events on a thread of its own, a little ahead of whoever takes
+/// Reads a log and decodes its events on a thread of its own, a little ahead of whoever takes
 /// them: to read and to use a log take about as long, and can be done at the same time.
 ///
-/// Events go over in batches. What has been read goes over before more is asked of the source, so
+/// Events go over in batches. What has been read goes over before the reader waits for more, so
 /// that no entry waits for one that comes later; and there are three batches in all, so that the
 /// thread is never more than two ahead.
 ///
-/// Threads: all members belong to one thread. Whoever destroys this before the end of the log has
-/// seen to it that the source does not block: the destructor waits for the thread.
+/// Threads: all members belong to one thread.
 class ReadAhead {
  public:
-  /// Whether an event is to be handed over. It is called on the reading thread.
+  /// Makes the reader of the log. Called on the reading thread, to which the reader belongs.
+  using Open = std::function<std::unique_ptr<EntryReader>()>;
+
+  /// Whether an event is to be handed over. Called on the reading thread.
   using Wanted = std::function<bool(const LogEvent&)>;
 
-  /// Throws `std::system_error` when the system has no thread for it. `source` must outlive this.
-  ReadAhead(ByteSource& source, Wanted wanted);
+  /// `stop` is what stops the reader, and must outlive this. Throws `std::system_error` when the
+  /// system has no thread for it.
+  ReadAhead(StopSignal& stop, Open open, Wanted wanted);
   ReadAhead(const ReadAhead&) = delete;
   ReadAhead& operator=(const ReadAhead&) = delete;
+
+  /// Stops the reader and waits for the thread.
   ~ReadAhead();
 
-  /// Goes on to the next event that is wanted. As `EntryReader::next`: `entry` is the only result
-  /// that another may follow.
+  /// Goes on to the next event that is wanted. As `EntryReader::next`, with what it, `Open` or
+  /// `Wanted` throws.
   EntryReader::Result next();
 
   /// The event of the last `next`, valid until the next call.
   const OSLogEventProxy& event() const { return taken.events[given - 1]; }
 
  private:
-  class Source;
-
   struct Batch {
     std::vector<FinishedEvent> events;  ///< their texts lie in `bytes`, which does not grow
     std::vector<char> bytes;
-    EntryReader::Result after = EntryReader::Result::entry;  ///< what follows the events
+
+    // What follows the events.
+    EntryReader::Result after = EntryReader::Result::entry;
+    std::exception_ptr failure;
   };
 
-  void readLog(ByteSource& source, const Wanted& wanted);
+  void run(const Open& open, const Wanted& wanted);
+  EntryReader::Result readLog(EntryReader& reader, const Wanted& wanted);
   void add(const LogEvent& event);
   void handOver();
   void takeOver();
 
+  StopSignal& stopSignal;
   Batch taken;            ///< the user's
   std::size_t given = 0;  ///< events of it that have been given
   Batch filling;          ///< the reading thread's

@@ -9,8 +9,8 @@ inline constexpr unsigned long kStreamInvalidated = 1;
 /// The log is damaged or cut off. All that stood whole before that has been delivered.
 inline constexpr unsigned long kStreamDamaged = 2;
 
-/// The log, or the rest of it, could not be read: an error of the file, or journalctl failed or
-/// complained.
+/// The log, or the rest of it, could not be read: an error of a file or of the journal's library,
+/// or too little memory or no thread for it.
 inline constexpr unsigned long kStreamUnreadable = 3;
 
 }  // namespace host

@@ -1,6 +1,8 @@
 #include "platform/oslog_store.h"
 
+#include <new>
 #include <stdexcept>
+#include <string>
 #include <system_error>
 #include <thread>
 #include <utility>
@@ -13,6 +15,7 @@
 #include "platform/host/log/ReadAhead.h"
 #include "platform/host/log/StopSignal.h"
 #include "platform/host/log/StreamEnd.h"
+#include "platform/system.h"
 
 namespace {
 
@@ -30,12 +33,14 @@ struct Delivery {
 };
 
 /// Delivers what is wanted until the log ends or the stream is stopped, and returns the reason.
-/// Throws `std::system_error` when the reading cannot be begun.
+/// Throws what reading throws.
 unsigned long deliverEvents(const Delivery& delivery) {
-  const auto bytes = delivery.source->open(delivery.from, delivery.filter, *delivery.stop);
-  host::ReadAhead reader(*bytes, [&delivery](const host::LogEvent& event) {
-    return event.date() >= delivery.from && delivery.filter.passes(event);
-  });
+  host::ReadAhead reader(
+      *delivery.stop,
+      [&delivery] { return delivery.source->open(delivery.from, delivery.filter, *delivery.stop); },
+      [&delivery](const host::LogEvent& event) {
+        return event.date() >= delivery.from && delivery.filter.passes(event);
+      });
   EntryReader::Result result = EntryReader::Result::stopped;
   while (!delivery.stop->raised()) {
     result = reader.next();
@@ -43,12 +48,18 @@ unsigned long deliverEvents(const Delivery& delivery) {
     if (delivery.eventHandler) delivery.eventHandler(reader.event());
   }
   if (delivery.stop->raised()) return host::kStreamInvalidated;
-  if (result == EntryReader::Result::damaged) return host::kStreamDamaged;
-  if (result != EntryReader::Result::end) return host::kStreamUnreadable;
   if (delivery.reasonOfNormalEnd) return *delivery.reasonOfNormalEnd;
   while (delivery.stop->waitReadable(-1)) {
   }
   return host::kStreamInvalidated;
+}
+
+/// Writes to the system log why the log was not read to its end.
+void report(const std::exception& why) noexcept {
+  try {
+    platform::logError("Cannot read the log to its end: " + std::string(why.what()));
+  } catch (const std::bad_alloc&) {  // the reason code has to do
+  }
 }
 
 /// Ends a stream. Nothing of it is left when the invalidation handler runs.
@@ -63,7 +74,11 @@ void run(Delivery delivery) {
   unsigned long reason = host::kStreamUnreadable;
   try {
     reason = deliverEvents(delivery);
-  } catch (const std::system_error&) {  // the reason says so
+  } catch (const host::DamagedLog& damage) {
+    reason = host::kStreamDamaged;
+    report(damage);
+  } catch (const std::exception& failure) {
+    report(failure);
   }
   end(std::move(delivery), reason);
 }
@@ -98,7 +113,8 @@ class HostStream final : public OSLogEventStream {
     const auto handed = std::make_shared<Delivery>(std::exchange(delivery, Delivery()));
     try {
       std::thread([handed] { run(std::move(*handed)); }).detach();
-    } catch (const std::system_error&) {
+    } catch (const std::system_error& failure) {
+      report(failure);
       end(std::move(*handed), host::kStreamUnreadable);
     }
   }
@@ -119,7 +135,7 @@ class HostStore final : public OSLogEventStore {
       const host::Profile& device = host::device();
       if (!device.logPrepareError.empty()) throw std::runtime_error(device.logPrepareError);
       source = host::prepareLog(device.log);
-    } catch (const std::runtime_error& failure) {
+    } catch (const std::exception& failure) {
       error = failure.what();
     }
     handler(std::move(source), error);
@@ -134,7 +150,7 @@ std::shared_ptr<OSLogEventStream> OSLogEventStream::initWithSource(
   if (log == nullptr) return nullptr;
   try {
     return std::make_shared<HostStream>(std::move(log));
-  } catch (const std::system_error&) {
+  } catch (const std::exception&) {
     return nullptr;
   }
 }

@@ -1,35 +1,12 @@
-#include "platform/host/log/EntryReader.h"
+#include "platform/host/log/RecordedLogReader.h"
 
 #include <algorithm>
 #include <charconv>
 #include <cstring>
+#include <utility>
 
 namespace host {
 namespace {
-
-constexpr std::array<std::string_view, static_cast<std::size_t>(Field::none)> kNames = {
-    "__REALTIME_TIMESTAMP",
-    "LOG_GMTOFF",
-    "LOG_TYPE",
-    "TID",
-    "_PID",
-    "SYSLOG_PID",
-    "LOG_ACTIVITY",
-    "_COMM",
-    "_EXE",
-    "SYSLOG_IDENTIFIER",
-    "LOG_SENDER_PATH",
-    "LOG_SUBSYSTEM",
-    "_SYSTEMD_UNIT",
-    "_TRANSPORT",
-    "LOG_CATEGORY",
-    "MESSAGE",
-};
-
-Field fieldCalled(std::string_view name) {
-  const auto* const found = std::ranges::find(kNames, name);
-  return static_cast<Field>(found - kNames.begin());
-}
 
 constexpr std::array<bool, 256> kNameBytes = [] {
   std::array<bool, 256> table{};
@@ -49,14 +26,17 @@ constexpr std::string_view kSeparatorPrefix = "-- ";
 
 }  // namespace
 
-EntryReader::EntryReader(ByteSource& bytes)
-    : source(bytes), buffer(kBuffer + 1, '\n'), position(buffer.data()), limit(position) {}
+RecordedLogReader::RecordedLogReader(std::unique_ptr<ByteSource> bytes)
+    : source(std::move(bytes)),
+      buffer(kBuffer + 1, '\n'),
+      position(buffer.data()),
+      limit(position) {}
 
-const char* EntryReader::endOfLine() const {
+const char* RecordedLogReader::endOfLine() const {
   return static_cast<const char*>(std::memchr(position, '\n', rest() + 1));
 }
 
-EntryReader::Result EntryReader::next() {
+EntryReader::Result RecordedLogReader::next() {
   do {
     startEntry();
     if (outcome != Result::entry || !readEntry()) return outcome;
@@ -64,7 +44,7 @@ EntryReader::Result EntryReader::next() {
   return Result::entry;
 }
 
-void EntryReader::startEntry() {
+void RecordedLogReader::startEntry() {
   current = LogEntry();
   begun = complete = false;
   // What a huge field has left behind is not held for good.
@@ -72,28 +52,27 @@ void EntryReader::startEntry() {
   kept = 0;
 }
 
-bool EntryReader::readDate() {
-  constexpr std::int64_t kEndOf9999 = 253'402'300'799'999'999;
+bool RecordedLogReader::readDate() {
   const std::string_view text = current[Field::realtimeTimestamp];
   const char* const end = text.data() + text.size();
   const auto [stop, error] = std::from_chars(text.data(), end, current.microseconds);
   return error == std::errc() && stop == end && current.microseconds >= 0 &&
-         current.microseconds <= kEndOf9999;
+         current.microseconds <= kMaxDate;
 }
 
-bool EntryReader::readEntry() {
+bool RecordedLogReader::readEntry() {
   while (!complete) {
     if (!readField()) return false;
   }
   return true;
 }
 
-bool EntryReader::readField() {
+bool RecordedLogReader::readField() {
   // The end of the line first: the next field can be looked at before this one is understood.
   const char* const lineEnd = endOfLine();
   const char* const nameEnd = endOfName(position);
   const auto size = static_cast<std::size_t>(nameEnd - position);
-  if (size > kMaxName) return damagedBy("a field name is too long");
+  if (size > kMaxName) damagedBy("a field name is too long");
   if (nameEnd == limit) return refill();  // and come back
   if (*nameEnd == '=' && size > 0) {
     const Field field = wanted({position, size});
@@ -113,57 +92,62 @@ bool EntryReader::readField() {
   return skipSeparator(lineEnd);
 }
 
-Field EntryReader::wanted(std::string_view name) {
+Field RecordedLogReader::wanted(std::string_view name) {
   begun = true;
   const Field field = fieldCalled(name);
   return field != Field::none && !current.has(field) ? field : Field::none;
 }
 
-bool EntryReader::skipSeparator(const char* lineEnd) {
-  if (begun || *position != kSeparatorPrefix[0]) return damagedBy("not a field name");
-  if (lineEnd == limit) return rest() < kBuffer ? refill() : damagedBy("a line is too long");
+bool RecordedLogReader::skipSeparator(const char* lineEnd) {
+  if (begun || *position != kSeparatorPrefix[0]) damagedBy("not a field name");
+  if (lineEnd == limit) {
+    if (rest() == kBuffer) damagedBy("a line is too long");
+    return refill();
+  }
   const std::string_view line(position, static_cast<std::size_t>(lineEnd - position));
-  if (!line.starts_with(kSeparatorPrefix)) return damagedBy("not a field name");
+  if (!line.starts_with(kSeparatorPrefix)) damagedBy("not a field name");
   position = lineEnd + 1;
   return true;
 }
 
-bool EntryReader::readText(Field field, const char* lineEnd) {
+bool RecordedLogReader::readText(Field field, const char* lineEnd) {
   if (lineEnd != limit) {
     take(field, static_cast<std::size_t>(lineEnd - position));
   } else {
     startPieces(field);
     for (; lineEnd == limit; lineEnd = endOfLine()) {
-      if (!takePiece(field, rest()) || !refill()) return false;
+      takePiece(field, rest());
+      if (!refill()) return false;
     }
-    if (!takePiece(field, static_cast<std::size_t>(lineEnd - position))) return false;
+    takePiece(field, static_cast<std::size_t>(lineEnd - position));
     endPieces(field);
   }
   ++position;
   return true;
 }
 
-bool EntryReader::readBinary(Field field) {
+bool RecordedLogReader::readBinary(Field field) {
   std::uint64_t length = 0;
   if (!readLength(length)) return false;
-  if (length > kMaxField) return damagedBy("a field is too long");
+  if (field != Field::none && length > kMaxField) damagedBy("a field is too long");
   if (length < rest()) {
     take(field, length);
   } else {
     startPieces(field);
     while (length >= rest()) {
       length -= rest();
-      if (!takePiece(field, rest()) || !refill()) return false;
+      takePiece(field, rest());
+      if (!refill()) return false;
     }
-    if (!takePiece(field, length)) return false;
+    takePiece(field, length);
     endPieces(field);
   }
-  if (*position != '\n') return damagedBy("no newline behind a binary field");
+  if (*position != '\n') damagedBy("no newline behind a binary field");
   ++position;
   return true;
 }
 
-bool EntryReader::readLength(std::uint64_t& length) {
+bool RecordedLogReader::readLength(std::uint64_t& length) {
   while (rest() < sizeof length) {
     if (!refill()) return false;
   }
@@ -173,65 +157,64 @@ bool EntryReader::readLength(std::uint64_t& length) {
   return true;
 }
 
-void EntryReader::take(Field field, std::size_t size) {
+void RecordedLogReader::take(Field field, std::size_t size) {
   if (field != Field::none) current.at(field) = {position, size};
+  count(field, size);
   position += size;
 }
 
-void EntryReader::startPieces(Field field) {
+void RecordedLogReader::startPieces(Field field) {
   pieces = 0;
   if (field != Field::none) copy(field).clear();
 }
 
-bool EntryReader::takePiece(Field field, std::size_t size) {
+void RecordedLogReader::takePiece(Field field, std::size_t size) {
   pieces += size;
   if (field != Field::none) {
-    kept += size;
+    if (pieces > kMaxField) damagedBy("a field is too long");
     copy(field).append(position, size);
   }
+  count(field, size);
   position += size;
-  if (pieces > kMaxField) return damagedBy("a field is too long");
-  return kept <= kMaxCopies || damagedBy("an entry is too long");
 }
 
-void EntryReader::endPieces(Field field) {
+void RecordedLogReader::count(Field field, std::size_t size) {
+  if (field != Field::none) kept += size;
+  if (kept > kMaxFields) damagedBy("an entry is too long");
+}
+
+void RecordedLogReader::endPieces(Field field) {
   if (field != Field::none) current.at(field) = copy(field);
 }
 
-bool EntryReader::refill() {
+bool RecordedLogReader::refill() {
   leaveBuffer();
   const std::size_t left = rest();
   consumed += static_cast<std::uint64_t>(position - buffer.data());
   std::memmove(buffer.data(), position, left);
   position = buffer.data();
-  const std::int64_t count = source.read(buffer.data() + left, kBuffer - left);
-  char* const end = buffer.data() + left + (count > 0 ? count : 0);
+  beforeWaiting();
+  const std::optional<std::size_t> count = source->read(buffer.data() + left, kBuffer - left);
+  char* const end = buffer.data() + left + count.value_or(0);
   *end = '\n';
   limit = end;
-  if (count > 0) return true;
-  if (count != ByteSource::kEnd) {
-    return stopWith(count == ByteSource::kStopped ? Result::stopped : Result::failed);
-  }
-  return begun || left > 0 ? damagedBy("cut off in an entry") : stopWith(Result::end);
+  if (count.value_or(0) > 0) return true;
+  if (count && (begun || left > 0)) damagedBy("cut off in an entry");
+  outcome = count ? Result::end : Result::stopped;
+  return false;
 }
 
-void EntryReader::leaveBuffer() {
+void RecordedLogReader::leaveBuffer() {
   for (std::size_t i = 0; i < copies.size(); ++i) {
     std::string_view& value = current.at(static_cast<Field>(i));
     if (value.data() == nullptr || value.data() == copies[i].data()) continue;
-    kept += value.size();
     value = copies[i].assign(value);
   }
 }
 
-bool EntryReader::stopWith(Result result) {
-  outcome = result;
-  return false;
-}
-
-bool EntryReader::damagedBy(const char* what) {
-  found = {what, consumed + static_cast<std::uint64_t>(position - buffer.data())};
-  return stopWith(Result::damaged);
+void RecordedLogReader::damagedBy(const char* what) const {
+  const std::uint64_t offset = consumed + static_cast<std::uint64_t>(position - buffer.data());
+  throw DamagedLog("damaged at byte " + std::to_string(offset) + ": " + what);
 }
 
 }  // namespace host

@@ -1,0 +1,192 @@
+#include "platform/host/log/JournalFiles.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <fstream>
+#include <optional>
+#include <stdexcept>
+#include <string_view>
+#include <system_error>
+
+#include "platform/posix/Ascii.h"
+
+namespace host {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr const char* kMachineIdFile = "/etc/machine-id";
+constexpr const char* kVolatileFolder = "/run/log/journal";
+constexpr const char* kKeptFolder = "/var/log/journal";
+
+/// The 32 small hexadecimal digits of a machine ID in any of its spellings; empty for other texts.
+std::string machineId(std::string_view text) {
+  constexpr std::string_view kPlain = "xxxxxxxxxxxxxxxxxxxxxxxxxxxxxxxx";
+  constexpr std::string_view kUuid = "xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx";
+  const std::string_view form = text.size() == kUuid.size() ? kUuid : kPlain;
+  if (text.size() != form.size()) return {};
+  std::string id;
+  for (std::size_t i = 0; i < form.size(); ++i) {
+    const char letter = posix::lowered(text[i]);
+    const bool isDigit = (letter >= '0' && letter <= '9') || (letter >= 'a' && letter <= 'f');
+    if (form[i] == 'x' ? !isDigit : letter != form[i]) return {};
+    if (isDigit) id += letter;
+  }
+  return id;
+}
+
+[[noreturn]] void refuseUnreadable(const fs::path& path, const std::error_code& error) {
+  std::string what = "Cannot read the journal: " + path.string() + ": " + error.message();
+  if (error == std::errc::permission_denied || error == std::errc::operation_not_permitted) {
+    what += ". Run as root or as a member of the group systemd-journal";
+  }
+  throw std::runtime_error(what);
+}
+
+/// The entries of a folder; none where there is no such folder.
+std::vector<fs::directory_entry> entriesOf(const fs::path& folder) {
+  std::vector<fs::directory_entry> entries;
+  std::error_code error;
+  fs::directory_iterator entry(folder, error);
+  for (; !error && entry != fs::directory_iterator(); entry.increment(error)) {
+    entries.push_back(*entry);
+  }
+  if (error && error != std::errc::no_such_file_or_directory) refuseUnreadable(folder, error);
+  return entries;
+}
+
+/// `folder` and those below it that are called by machine IDs, or by `onlyId`.
+void addFolders(const fs::path& folder, const std::optional<std::string>& onlyId,
+                std::vector<fs::path>& folders) {
+  folders.push_back(folder);
+  for (const fs::directory_entry& entry : entriesOf(folder)) {
+    const std::string id = machineId(entry.path().filename().string());
+    std::error_code error;
+    if (id.empty() || (onlyId && id != *onlyId) || !entry.is_directory(error)) continue;
+    folders.push_back(entry.path());
+  }
+}
+
+std::vector<fs::path> foldersOf(const std::string& journal) {
+  std::vector<fs::path> folders;
+  if (journal.empty()) {
+    std::string text;
+    std::getline(std::ifstream(kMachineIdFile), text);
+    const std::string id = machineId(text);
+    if (id.empty()) {
+      throw std::runtime_error(std::string("No journal: ") + kMachineIdFile + " names no machine");
+    }
+    addFolders(kVolatileFolder, std::nullopt, folders);
+    addFolders(kKeptFolder, id, folders);
+  } else if (fs::is_directory(journal)) {
+    addFolders(journal, std::nullopt, folders);
+  }
+  return folders;
+}
+
+/// The paths of the files, of which some may be gone by now.
+std::vector<fs::path> filesOf(const std::string& journal) {
+  const std::vector<fs::path> folders = foldersOf(journal);
+  if (folders.empty()) return {journal};
+  std::vector<fs::path> files;
+  for (const fs::path& folder : folders) {
+    for (const fs::directory_entry& entry : entriesOf(folder)) {
+      const fs::path ending = entry.path().extension();
+      std::error_code error;
+      if (ending != ".journal" && ending != ".journal~") continue;
+      if (entry.is_regular_file(error) || entry.is_symlink(error)) files.push_back(entry.path());
+    }
+  }
+  return files;
+}
+
+/// What tells a file from all others, whatever its name.
+struct Identity {
+  explicit Identity(const struct stat& about) : device(about.st_dev), inode(about.st_ino) {}
+  auto operator<=>(const Identity&) const = default;
+
+  dev_t device;
+  ino_t inode;
+};
+
+std::optional<Identity> identityOf(const fs::path& path) {
+  struct stat about {};
+  if (::stat(path.c_str(), &about) != 0) return std::nullopt;
+  return Identity(about);
+}
+
+using Identities = std::vector<Identity>;
+
+Identities identitiesOf(const std::vector<JournalFile>& files) {
+  Identities identities;
+  for (const JournalFile& file : files) {
+    struct stat about {};
+    if (::fstat(file.descriptor.get(), &about) == 0) identities.emplace_back(about);
+  }
+  std::ranges::sort(identities);
+  return identities;
+}
+
+Identities identitiesOf(const std::vector<fs::path>& paths) {
+  Identities identities;
+  for (const fs::path& path : paths) {
+    if (const auto identity = identityOf(path)) identities.push_back(*identity);
+  }
+  std::ranges::sort(identities);
+  return identities;
+}
+
+std::vector<JournalFile> openAll(const std::vector<fs::path>& paths) {
+  std::vector<JournalFile> files;
+  for (const fs::path& path : paths) {
+    posix::Descriptor opened(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+    if (opened) {
+      files.push_back({path, std::move(opened)});
+    } else if (errno != ENOENT) {
+      refuseUnreadable(path, {errno, std::generic_category()});
+    }
+  }
+  return files;
+}
+
+/// The folder that holds the file at `path`, or would hold one made there: links that lead nowhere
+/// yet are followed.
+fs::path folderOf(fs::path path) {
+  constexpr int kMostLinks = 40;
+  for (int links = 0; links < kMostLinks && fs::is_symlink(path); ++links) {
+    path = path.parent_path() / fs::read_symlink(path);
+  }
+  return path.has_parent_path() ? path.parent_path() : ".";
+}
+
+}  // namespace
+
+std::vector<JournalFile> openJournalFiles(const std::string& journal) {
+  constexpr int kMostRotations = 100;
+  std::vector<JournalFile> files = openAll(filesOf(journal));
+  for (int i = 0; identitiesOf(files) != identitiesOf(filesOf(journal)); ++i) {
+    if (i == kMostRotations) throw std::runtime_error("Cannot read the journal: it keeps changing");
+    files = openAll(filesOf(journal));
+  }
+  if (!files.empty()) return files;
+  if (!journal.empty()) throw std::runtime_error("No journal: no journal files in " + journal);
+  throw std::runtime_error(std::string("No journal: no journal files in ") + kKeptFolder + " or " +
+                           kVolatileFolder + ". Is systemd-journald running?");
+}
+
+bool isOfJournal(const std::string& journal, const std::string& path) try {
+  const auto folder = identityOf(folderOf(path));
+  const auto file = identityOf(path);
+  const auto isOneOf = [](const std::optional<Identity>& identity, const Identities& all) {
+    return identity && std::ranges::binary_search(all, *identity);
+  };
+  return isOneOf(folder, identitiesOf(foldersOf(journal))) ||
+         isOneOf(file, identitiesOf(filesOf(journal)));
+} catch (const std::exception&) {
+  return true;
+}
+
+}  // namespace host

@@ -1,0 +1,249 @@
+#include "platform/host/log/JournalReader.h"
+
+#include <fcntl.h>
+#include <systemd/sd-journal.h>
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <span>
+#include <string>
+#include <system_error>
+#include <vector>
+
+#include "platform/host/log/JournalFaults.h"
+
+namespace host {
+namespace {
+
+constexpr std::string_view kCannotRead = "Cannot read the journal: ";
+
+/// A journal that the library has open. Threads: all of it belongs to one thread.
+class OpenJournal {
+ public:
+  /// Throws `std::system_error`.
+  explicit OpenJournal(std::span<const JournalFile> files) {
+    std::vector<posix::Descriptor> copies;
+    std::vector<int> numbers;
+    for (const JournalFile& file : files) {
+      copies.emplace_back(::fcntl(file.descriptor.get(), F_DUPFD_CLOEXEC, 0));
+      if (!copies.back()) throw std::system_error(errno, std::generic_category());
+      numbers.push_back(copies.back().get());
+    }
+    sd_journal* opened = nullptr;
+    const auto count = static_cast<unsigned>(numbers.size());
+    const int result = ::sd_journal_open_files_fd(&opened, numbers.data(), count, 0);
+    if (result >= 0) {
+      journal.reset(opened);
+      for (posix::Descriptor& copy : copies) copy.release();  // they are the library's now
+    }
+    check(result);
+  }
+
+  sd_journal* get() const { return journal.get(); }
+
+  /// `result`, of a call of the library, unless it is an error, which it throws.
+  int check(int result) const {
+    if (faults.any()) throw std::runtime_error("truncated while it was read");
+    if (result < 0) throw std::system_error(-result, std::generic_category());
+    return result;
+  }
+
+ private:
+  struct Close {
+    void operator()(sd_journal* opened) const { ::sd_journal_close(opened); }
+  };
+
+  JournalFaults faults;
+  std::unique_ptr<sd_journal, Close> journal;
+};
+
+/// A field as the library gives it, "NAME=value".
+struct NamedValue {
+  NamedValue(const void* data, std::size_t size)
+      : whole(static_cast<const char*>(data), size), nameSize(whole.find('=')) {}
+
+  std::string_view name() const { return whole.substr(0, nameSize); }
+  std::string_view value() const {
+    return nameSize == std::string_view::npos ? "" : whole.substr(nameSize + 1);
+  }
+
+  std::string_view whole;
+  std::size_t nameSize;
+};
+
+/// Of a compressed value, as much as is uncompressed at first: unwanted ones may be huge.
+constexpr std::size_t kFirstPart = std::size_t{64} << 10;
+
+/// What is uncompressed of a wanted one: enough to see that it is too long.
+constexpr std::size_t kWantedPart = kMaxField + 1024;
+
+class JournalReader final : public EntryReader {
+ public:
+  JournalReader(std::vector<JournalFile> opened, OSLogDate date, const EventFilter& events,
+                const StopSignal& signal)
+      : files(std::move(opened)), from(date), filter(events), stop(signal), journal(files) {}
+
+  Result next() override try {
+    if (!begun) begin();
+    while (!stop.raised()) {
+      constexpr unsigned kEntriesAtATime = 256;
+      if (entries++ % kEntriesAtATime == 0) beforeWaiting();
+      if (!mayHaveMore || journal.check(::sd_journal_next(journal.get())) == 0) {
+        checkFiles();
+        return Result::end;
+      }
+      if (readEntry()) return Result::entry;
+    }
+    return Result::stopped;
+  } catch (const DamagedLog&) {
+    throw;
+  } catch (const std::exception& error) {
+    checkFiles();  // may know which file it is
+    throw std::runtime_error(std::string(kCannotRead) + error.what());
+  }
+
+ private:
+  void begin() {
+    begun = true;
+    mayHaveMore = addMatches();
+    if (from.microsecondsSince1970() > 0) {
+      const auto since = static_cast<std::uint64_t>(from.microsecondsSince1970());
+      journal.check(::sd_journal_seek_realtime_usec(journal.get(), since));
+    } else {
+      journal.check(::sd_journal_seek_head(journal.get()));
+    }
+  }
+
+  /// Each file still has what its header says. What has been cut off or dropped since it was
+  /// opened, the library may have passed over.
+  void checkFiles() const {
+    for (const JournalFile& file : files) checkJournalFile(file);
+  }
+
+  /// False when the entry has no date that an event can have.
+  bool readEntry() {
+    if (size > kFirstPart) copies = {};  // what huge fields have left is not held
+    current = LogEntry();
+    size = 0;
+    std::uint64_t date = 0;
+    journal.check(::sd_journal_get_realtime_usec(journal.get(), &date));
+    if (date > kMaxDate) return false;
+    current.microseconds = static_cast<std::int64_t>(date);
+    ::sd_journal_restart_data(journal.get());
+    const void* data = nullptr;
+    std::size_t length = 0;
+    while (journal.check(::sd_journal_enumerate_data(journal.get(), &data, &length)) > 0) {
+      take(NamedValue(data, length));
+    }
+    return true;
+  }
+
+  void take(const NamedValue& given) {
+    const Field field = fieldCalled(given.name());
+    if (field == Field::none || field == Field::realtimeTimestamp || current.has(field)) return;
+    if (given.whole.size() < kFirstPart) return keep(field, given.value());
+    // All of it, if it is one that has been compressed.
+    const void* data = nullptr;
+    std::size_t length = 0;
+    ::sd_journal_set_data_threshold(journal.get(), kWantedPart);
+    const std::string name(nameOf(field));
+    journal.check(::sd_journal_get_data(journal.get(), name.c_str(), &data, &length));
+    ::sd_journal_set_data_threshold(journal.get(), kFirstPart);
+    keep(field, NamedValue(data, length).value());
+  }
+
+  void keep(Field field, std::string_view value) {
+    size += value.size();
+    if (value.size() > kMaxField) damagedBy("a field is too long");
+    if (size > kMaxFields) damagedBy("an entry is too long");
+    current.at(field) = copies[static_cast<std::size_t>(field)].assign(value);
+  }
+
+  [[noreturn]] void damagedBy(const char* what) const {
+    throw DamagedLog("entry of " + std::to_string(current.microseconds) + " us: " + what);
+  }
+
+  // What the index is asked for: the values of the fields that a process name or an image's path
+  // comes from, of which each that lets an event pass is a match. The filter itself decides, so
+  // that matches may let pass too much, and nothing is missed.
+
+  /// Adds the matches; false when no event can pass.
+  bool addMatches() {
+    LogEntry entry;
+    const LogEvent event(entry);
+    if (filter.passes(event)) return true;  // needs no field to pass
+    ::sd_journal_set_data_threshold(journal.get(), kWantedPart);
+    const std::vector<std::string> images = uniqueValues(Field::exe);
+    for (const Field field :
+         {Field::comm, Field::syslogIdentifier, Field::exe, Field::senderPath}) {
+      for (const std::string& value : uniqueValues(field)) {
+        entry = LogEntry();
+        entry.at(field) = value;
+        const bool passes =
+            filter.passes(event) || (field == Field::comm && passesWhole(entry, images));
+        if (passes) addMatch(field, value);
+      }
+      journal.check(::sd_journal_add_disjunction(journal.get()));
+    }
+    ::sd_journal_set_data_threshold(journal.get(), kFirstPart);
+    return matches > 0;
+  }
+
+  /// Whether one of `images` makes a longer name of the process of `entry`, one that passes.
+  bool passesWhole(LogEntry& entry, const std::vector<std::string>& images) const {
+    const LogEvent event(entry);
+    const std::string cut(event.process());
+    return std::ranges::any_of(images, [&](const std::string& image) {
+      entry.at(Field::exe) = image;
+      return event.process() != cut && filter.passes(event);
+    });
+  }
+
+  void addMatch(Field field, const std::string& value) {
+    const std::string match = std::string(nameOf(field)) + '=' + value;
+    journal.check(::sd_journal_add_match(journal.get(), match.data(), match.size()));
+    ++matches;
+  }
+
+  /// The values that a field has anywhere in the journal; fewer once the reader is stopped.
+  std::vector<std::string> uniqueValues(Field field) {
+    std::vector<std::string> values;
+    const std::string name(nameOf(field));
+    journal.check(::sd_journal_query_unique(journal.get(), name.c_str()));
+    const void* data = nullptr;
+    std::size_t length = 0;
+    while (!stop.raised() &&
+           journal.check(::sd_journal_enumerate_unique(journal.get(), &data, &length)) > 0) {
+      values.emplace_back(NamedValue(data, length).value());
+    }
+    return values;
+  }
+
+  const std::vector<JournalFile> files;
+  const OSLogDate from;
+  const EventFilter& filter;
+  const StopSignal& stop;
+  const OpenJournal journal;
+  bool begun = false;
+  bool mayHaveMore = true;
+  std::size_t matches = 0;
+  unsigned entries = 0;
+  std::size_t size = 0;  ///< of the values of the current entry
+  std::array<std::string, static_cast<std::size_t>(Field::none)> copies;
+};
+
+}  // namespace
+
+void checkJournalFile(const JournalFile& file) try {
+  const OpenJournal alone({&file, 1});
+} catch (const std::exception& error) {
+  throw std::runtime_error(std::string(kCannotRead) + file.path.string() + ": " + error.what());
+}
+
+std::unique_ptr<EntryReader> readJournal(std::vector<JournalFile> files, OSLogDate from,
+                                         const EventFilter& filter, const StopSignal& stop) {
+  return std::make_unique<JournalReader>(std::move(files), from, filter, stop);
+}
+
+}  // namespace host

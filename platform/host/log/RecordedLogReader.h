@@ -1,0 +1,82 @@
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "platform/host/log/ByteSource.h"
+#include "platform/host/log/EntryReader.h"
+
+namespace host {
+
+/// Reads a log in the Journal Export Format, one entry after the other, from any bytes at all.
+///
+/// An entry is whole when the empty line behind it has been read, and only whole entries are
+/// given. So a log that stops anywhere else is cut, be it behind the line of a field: its last
+/// entry is dropped and its end is damage. A log of no bytes is whole.
+///
+/// Damage is, besides: a field name that is empty, longer than kMaxName, or not of A-Z, 0-9 and _;
+/// wanted fields longer than an entry may have; a binary field without a newline behind it.
+///
+/// Skipped without a word: an entry that has no date or one that cannot be read, and, between
+/// entries, empty lines and lines that start with "-- ", which journalctl puts there for a reboot.
+///
+/// Memory is one buffer, and copies of those wanted fields that do not fit into it.
+class RecordedLogReader final : public EntryReader {
+ public:
+  static constexpr std::size_t kBuffer = std::size_t{256} << 10;
+  static constexpr std::size_t kMaxName = 255;
+
+  explicit RecordedLogReader(std::unique_ptr<ByteSource> bytes);
+
+  Result next() override;
+
+ private:
+  void startEntry();
+  bool readEntry();
+  bool readDate();
+
+  // Each of these is false when nothing more is to be read, with `outcome` set. `field` is none
+  // where the value is not wanted; `lineEnd` is `limit` where the line goes on behind it.
+  bool readField();
+  bool skipSeparator(const char* lineEnd);
+  bool readText(Field field, const char* lineEnd);
+  bool readBinary(Field field);
+  bool readLength(std::uint64_t& length);
+  bool refill();
+  [[noreturn]] void damagedBy(const char* what) const;
+
+  void count(Field field, std::size_t size);
+
+  // A value is taken where it lies, or piece by piece into a copy when the buffer cannot hold it.
+  void take(Field field, std::size_t size);
+  void startPieces(Field field);
+  void takePiece(Field field, std::size_t size);
+  void endPieces(Field field);
+  void leaveBuffer();
+
+  const char* endOfLine() const;
+  Field wanted(std::string_view name);
+  std::size_t rest() const { return static_cast<std::size_t>(limit - position); }
+  std::string& copy(Field field) { return copies[static_cast<std::size_t>(field)]; }
+
+  const std::unique_ptr<ByteSource> source;
+  std::vector<char> buffer;    ///< of kBuffer bytes, and a newline after those that it holds
+  const char* position;        ///< of the first byte not yet read, in the buffer
+  const char* limit;           ///< the end of what the buffer holds
+  std::uint64_t consumed = 0;  ///< bytes of the log before the buffer
+
+  bool begun = false;      ///< a field of the current entry has been read, or begun
+  bool complete = false;   ///< the current entry is whole
+  std::size_t pieces = 0;  ///< bytes taken of the current field
+  std::size_t kept = 0;    ///< bytes of the wanted fields of the current entry
+  std::array<std::string, static_cast<std::size_t>(Field::none)> copies;
+
+  Result outcome = Result::entry;
+};
+
+}  // namespace host
