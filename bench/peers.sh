@@ -1,12 +1,13 @@
 #!/usr/bin/env bash
-# The same entries, printed by journalctl from journal files and exported by zubtool from a recorded
-# log: everything, and one process in eight. Needs systemd-journal-remote and a release build.
+# The same entries, printed by journalctl and exported by zubtool, from six journal files and from
+# a recorded log. Needs systemd-journal-remote and a release build with libsystemd.
 # usage: bench/peers.sh [MESSAGES [RUNS]]
 set -euo pipefail
 
 messages=${1:-1000000}
 runs=${2:-5}
 top=$(cd "$(dirname "$0")/.." && pwd)
+tool=$top/build/release/tool/zubtool
 remote=$(command -v systemd-journal-remote || echo /lib/systemd/systemd-journal-remote)
 [ -x "$remote" ] || { echo "peers.sh: please install systemd-journal-remote" >&2; exit 1; }
 
@@ -14,37 +15,64 @@ work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 mkdir "$work/journal"
 "$top/build/release/bench/make_log" "$messages" "$work/log"
-echo "log = $work/log" >"$work/device"
-"$remote" --output="$work/journal/all.journal" "$work/log" >/dev/null 2>&1
+awk -v each=$((messages / 6 + 1)) -v to="$work/part" '
+  BEGIN { RS = ""; ORS = "\n\n" } { print > (to int((NR - 1) / each)) }' "$work/log"
+for part in "$work"/part*; do
+  "$remote" --output="$work/journal/${part##*/}.journal" "$part" >/dev/null 2>&1
+  rm "$part"
+done
+echo "log = ./journal" >"$work/folder"
+echo "log = ./log" >"$work/recorded"
 
-journalctl_run() { journalctl -D "$work/journal" -o short --no-pager -q "$@" >"$work/theirs"; }
-zubtool_run() {
-  ZUB_DEVICE=$work/device "$top/build/release/tool/zubtool" logdump oslog 2147483647 "$work/ours" "$@"
-}
+theirs() { journalctl -D "$work/journal" --no-pager -q -o "$@" >"$work/out"; }
+ours() { ZUB_DEVICE=$work/$1 "$tool" logdump oslog 2147483647 "$work/out" "${@:2}"; }
+starts() { "$tool" --; }
 
-seconds() {  # COMMAND ...: the median wall time of its runs
+# Each line of `rivals` is a name and a command; the runs of all take turns. Prints the medians of
+# wall and processor time, without what a start of the tool takes.
+measure() {  # WHAT
+  local i name command
+  echo "$1, in seconds without start-up:"
   for ((i = 0; i < runs; i++)); do
-    local start=$EPOCHREALTIME
-    "$@" >&2
-    echo "$start $EPOCHREALTIME"
-  done | awk '{ print $2 - $1 }' | sort -n | sed -n "$(((runs + 1) / 2))p"
+    while IFS=: read -r name command; do
+      TIMEFORMAT="%R %U %S"
+      { time $command; } 2>"$work/time"
+      echo "$name:$(tail -n 1 "$work/time"):$(wc -l <"$work/out")"
+    done <<<"$rivals"
+  done | sort -t: -k1,1 -s | awk -F: -v start="${start_up:-0}" '
+    function median(list, n,  i, j, t) {
+      for (i = 2; i <= n; i++) for (j = i; j > 1 && list[j] < list[j-1]; j--) {
+        t = list[j]; list[j] = list[j-1]; list[j-1] = t
+      }
+      return list[int((n + 1) / 2)]
+    }
+    function show() {
+      if (n) printf "  %-28s wall %6.2f  processor %6.2f  lines %d\n", last,
+                    median(wall, n) - (last ~ /zubtool/ ? start : 0), median(used, n), lines
+      n = 0
+    }
+    $1 != last { show(); last = $1 }
+    { split($2, t, " "); wall[++n] = t[1]; used[n] = t[2] + t[3]; lines = $3 }
+    END { show() }'
 }
 
-compare() {  # WHAT journalctl-words -- zubtool-words
-  local what=$1 theirs ours
-  shift
-  local words=()
-  while [ "$1" != -- ]; do words+=("$1"); shift; done
-  shift
-  theirs=$(seconds journalctl_run "${words[@]}")
-  ours=$(seconds zubtool_run "$@")
-  awk -v start="$start_up" -v what="$what" -v theirs="$theirs" -v ours="$ours" -v lines="$(wc -l <"$work/ours")" -v other="$(wc -l <"$work/theirs")" '
-    BEGIN { printf "%-12s journalctl %.2f s (%d lines), zubtool %.2f s (%d lines): %.1f times as fast, %.1f without its start-up of %.2f s\n",
-      what, theirs, other, ours, lines, theirs / ours, theirs / (ours - start), start }'
-}
+rivals='tool:starts'
+: >"$work/out"
+start_up=$(measure start | awk '/tool/ { print $3 }')
+echo "start-up of zubtool, which waits for a server: $start_up s"
 
-# Half a second of waiting for the server, which journalctl has nothing to set against.
-start_up=$(seconds "$top/build/release/tool/zubtool" --)
+rivals='journalctl -o short:theirs short
+journalctl -o export:theirs export
+zubtool, folder:ours folder all
+zubtool, recorded log:ours recorded all'
+measure "Everything"
 
-compare everything -- all
-compare one-in-8 _COMM=sshd -- -p sshd
+rivals='journalctl -o short _COMM=:theirs short _COMM=sshd
+zubtool -p, folder:ours folder -p sshd
+zubtool -i, folder:ours folder -i sshd
+zubtool -p, recorded log:ours recorded -p sshd'
+measure "One process in eight"
+
+rivals='zubtool, folder:ours folder -p nobody -i nowhere
+zubtool, recorded log:ours recorded -p nobody -i nowhere'
+measure "Nothing that matches"
