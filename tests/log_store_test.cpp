@@ -425,8 +425,7 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
 TEST_F(Journal, RefusesAFileThatItCannotRead) {
   const std::string file = makeFile("x", logOf(10));
   write("y.journal", "");
-  EXPECT_EQ(prepareError(folder),
-            "Cannot read the journal: " + folder + "/y.journal: No data available");
+  EXPECT_EQ(prepareError(folder), "Cannot read the journal: " + folder + "/y.journal: cut off");
   std::filesystem::remove(folder + "/y.journal");
   const auto late = stream(folder);
   std::filesystem::resize_file(file, 100);

@@ -7,6 +7,7 @@
 #include <array>
 #include <cerrno>
 #include <span>
+#include <stdexcept>
 #include <string>
 #include <system_error>
 #include <vector>
@@ -18,16 +19,32 @@ namespace {
 
 constexpr std::string_view kCannotRead = "Cannot read the journal: ";
 
+/// An error of the library, which has meanings of its own for some numbers.
+std::runtime_error libraryError(int number) {
+  switch (number) {
+    case ENODATA:
+      return std::runtime_error("cut off");
+    case EBADMSG:
+      return std::runtime_error("no journal file, or damaged");
+    case EIDRM:
+      return std::runtime_error("deleted while it was read");
+    case EPROTONOSUPPORT:
+      return std::runtime_error("made by a later version of systemd");
+    default:
+      return std::runtime_error(std::generic_category().message(number));
+  }
+}
+
 /// A journal that the library has open. Threads: all of it belongs to one thread.
 class OpenJournal {
  public:
-  /// Throws `std::system_error`.
+  /// Throws `std::runtime_error`.
   explicit OpenJournal(std::span<const JournalFile> files) {
     std::vector<posix::Descriptor> copies;
     std::vector<int> numbers;
     for (const JournalFile& file : files) {
       copies.emplace_back(::fcntl(file.descriptor.get(), F_DUPFD_CLOEXEC, 0));
-      if (!copies.back()) throw std::system_error(errno, std::generic_category());
+      if (!copies.back()) throw libraryError(errno);
       numbers.push_back(copies.back().get());
     }
     sd_journal* opened = nullptr;
@@ -45,7 +62,7 @@ class OpenJournal {
   /// `result`, of a call of the library, unless it is an error, which it throws.
   int check(int result) const {
     if (faults.any()) throw std::runtime_error("truncated while it was read");
-    if (result < 0) throw std::system_error(-result, std::generic_category());
+    if (result < 0) throw libraryError(-result);
     return result;
   }
 

@@ -22,7 +22,7 @@ void checkJournalFile(const JournalFile& file);
 ///
 /// What the library passes over in silence, such as bytes overwritten inside a file, is missing in
 /// silence here as well. But each file must still pass the check above at the end, so one that has
-/// been truncated or deleted with its contents meanwhile is an error, and no smaller journal.
+/// been truncated or deleted meanwhile, of which the library may have read less, is an error.
 std::unique_ptr<EntryReader> readJournal(std::vector<JournalFile> files, OSLogDate from,
                                          const EventFilter& filter, const StopSignal& stop);
 

@@ -57,7 +57,7 @@ unsigned long deliverEvents(const Delivery& delivery) {
 /// Writes to the system log why the log was not read to its end.
 void report(const std::exception& why) noexcept {
   try {
-    platform::logError("Cannot read the log to its end: " + std::string(why.what()));
+    platform::logError("Log not read to its end: " + std::string(why.what()));
   } catch (const std::bad_alloc&) {  // the reason code has to do
   }
 }
