@@ -3,6 +3,7 @@
 #include <atomic>
 #include <charconv>
 #include <mutex>
+#include <new>
 
 #include "platform/oslog_store.h"
 #include "platform/system.h"
@@ -20,17 +21,23 @@ class LineFile {
  public:
   explicit LineFile(std::unique_ptr<platform::FileHandle> opened) : file(std::move(opened)) {}
 
-  /// Writes `line`, unless the file is closed. False when it could not be written whole; that
-  /// closes the file.
-  bool append(const std::string& line) {
-    bool written = true;
+  /// Writes `line`, unless the file is closed. Returns why not all of it could be written, if so;
+  /// that closes the file.
+  std::error_code append(const std::string& line) {
+    std::error_code failure;
     {
       const std::lock_guard lock(mutex);
-      if (!closing) written = file->write(line);
-      if (!written) failed = closing = true;
+      if (!closing) failure = file->write(line);
+      if (failure) failed = closing = true;
     }
     if (closing) close();
-    return written;
+    return failure;
+  }
+
+  /// Closes the file for the want of a line that should be in it.
+  void fail() {
+    failed = true;
+    close();
   }
 
   /// Does not wait for a line that is being written, for a stalled reader may hold it up for good:
@@ -113,12 +120,24 @@ std::string FormatLine(const OSLogEventProxy& event) {
   return line;
 }
 
+/// Appends the line of `event`. Returns why that was not possible, if so; the file is then closed.
+std::error_code AppendLine(LineFile& file, const OSLogEventProxy& event) {
+  try {
+    return file.append(FormatLine(event));
+  } catch (const std::bad_alloc&) {
+    file.fail();
+    return std::make_error_code(std::errc::not_enough_memory);
+  }
+}
+
 void SetHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& file,
                  const std::string& path, const dispatch::group& group) {
   const std::weak_ptr<OSLogEventStream> weakStream = stream;  // the stream owns its handlers
   stream->setEventHandler([file, path, weakStream](const OSLogEventProxy& event) {
-    if (event.type() != kOSLogEventTypeLogMessage || file->append(FormatLine(event))) return;
-    platform::logError("Failed to write file: " + path);
+    if (event.type() != kOSLogEventTypeLogMessage) return;
+    const auto failure = AppendLine(*file, event);
+    if (!failure) return;
+    platform::logError("Failed to write file: " + path + ": " + failure.message());
     if (const auto failing = weakStream.lock()) failing->invalidate();
   });
   stream->setInvalidationHandler([group](unsigned long reason, const OSLogEventStreamPosition&) {
@@ -155,8 +174,7 @@ bool OsLogStream::putWithin(std::chrono::nanoseconds timeout, const std::string&
                             const std::list<std::string>& imagePath, double history) {
   const auto stream = PrepareStream();
   if (!stream) return false;
-  platform::createEmptyFile(path);
-  auto opened = platform::FileHandle::openForAppending(path);
+  auto opened = platform::FileHandle::createEmpty(path);
   if (!opened) {
     platform::logError("Failed to create file: " + path);
     return false;

@@ -13,17 +13,19 @@ class OsLogStream {
  public:
   OsLogStream() = delete;
 
-  /// Empties the file at `path` and appends a line for each message of the last `history` seconds
-  /// that a process named in `process` logged, or an image whose path contains one of `imagePath`,
-  /// whatever case and accents; every message when both lists are empty. Blocks until the log has
-  /// been copied, or 180 seconds have passed.
+  /// Makes the file at `path` or empties the one that is there, and appends a line for each message
+  /// of the last `history` seconds that a process named in `process` logged, or an image whose path
+  /// contains one of `imagePath`, whatever case and accents; every message when both lists are
+  /// empty. Blocks until the log has been copied, or 180 seconds have passed.
   ///
   /// True when the log store ended the stream in time; it may have ended it early, which it says in
   /// the system log. False, and the reason in the system log, when the log or the file cannot be
   /// opened, a line cannot be written whole, or the time is up; lines written until then stay.
   /// Threads: any; a call keeps nothing for the next.
-  static bool putOsLogStreamToFile(const std::string& path, const std::list<std::string>& process,
-                                   const std::list<std::string>& imagePath, double history);
+  [[nodiscard]] static bool putOsLogStreamToFile(const std::string& path,
+                                                 const std::list<std::string>& process,
+                                                 const std::list<std::string>& imagePath,
+                                                 double history);
 
  private:
   friend struct OsLogStreamClock;  // lets a test wait for less than 180 seconds

@@ -3,6 +3,7 @@
 #include <memory>
 #include <string>
 #include <string_view>
+#include <system_error>
 
 /// The name under which the program was invoked, without its folder. Owned by the C library, as
 /// in getprogname(3) of the BSDs. Any thread.
@@ -19,28 +20,25 @@ void runMainEventLoop();
 /// a file's size, costs the output and not the process.
 void openStandardStreams();
 
-/// Sees to it that there is an empty file at `path`: makes one, or empties the one that is there.
-/// What is no regular file (a device, a pipe) is left as it is. A failure is not reported: what
-/// counts is whether the file can be opened then. Any thread.
-void createEmptyFile(const std::string& path);
-
 /// A file open for writing at its end; it closes when destroyed.
 ///
 /// Threads: one at a time.
 class FileHandle {
  public:
-  /// Opens the existing file at `path`. Null when that is not possible, which includes a pipe that
-  /// nobody reads, and what the device itself reads.
-  static std::unique_ptr<FileHandle> openForAppending(const std::string& path);
+  /// Opens the file at `path` and empties it, or makes it, for its owner alone. A device or a pipe
+  /// is opened as it is. Null when any of that is not possible, which includes a pipe that nobody
+  /// reads, and what the device itself reads; such a file is left as it was. Never waits.
+  static std::unique_ptr<FileHandle> createEmpty(const std::string& path);
 
   FileHandle() = default;
   FileHandle(const FileHandle&) = delete;
   FileHandle& operator=(const FileHandle&) = delete;
   virtual ~FileHandle() = default;
 
-  /// Appends `bytes` in one system call, with nothing buffered. False when not all of them could
-  /// be written; how many were is not known.
-  [[nodiscard]] virtual bool write(std::string_view bytes) = 0;
+  /// Appends all of `bytes`, with nothing buffered, in one system call where the system takes them
+  /// so. Waits for a reader that is slow, without end. Returns what went wrong, if anything did;
+  /// how much was written then is not known.
+  [[nodiscard]] virtual std::error_code write(std::string_view bytes) = 0;
 };
 
 /// Writes `message` to the system log's default log object at error level. Never to the terminal.

@@ -2,11 +2,14 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <array>
 #include <mutex>
+#include <new>
 #include <thread>
 
 #include "framework/WordList.h"
@@ -47,7 +50,9 @@ struct Event : OSLogEventProxy {
   std::string_view sender() const override { return "image"; }
   std::string_view subsystem() const override { return "sub.sys"; }
   std::string_view category() const override { return "cat"; }
-  std::string_view composedMessage() const override { return message; }
+  std::string_view composedMessage() const override {
+    return message != "too long" ? message : throw std::bad_alloc();
+  }
 };
 
 /// What the store does in a test, and what it was asked.
@@ -154,8 +159,15 @@ class OsLogStreamTest : public ::testing::Test, public Script {
 
 using Texts = std::vector<std::string>;
 
+unsigned modeOf(const std::string& path) {
+  struct stat about {};
+  stat(path.c_str(), &about);
+  return about.st_mode & 0777;
+}
+
 TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
   writeFile(output, "old");
+  ASSERT_EQ(chmod(output.c_str(), 0644), 0);
   const auto before = OSLogDate::now();
   EXPECT_TRUE(OsLogStream::putOsLogStreamToFile(output, {"p1", "p2"}, {"I"}, 3600));
   EXPECT_EQ(calls,
@@ -165,6 +177,7 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
   EXPECT_GE(start, before.addingSeconds(-3600));
   EXPECT_LE(start, OSLogDate::now().addingSeconds(-3600));
   EXPECT_EQ(readFile(output), line);
+  EXPECT_EQ(modeOf(output), 0644U) << "that of the file that was there";
 }
 
 TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
@@ -206,6 +219,7 @@ TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {
             "1969-12-31 23:59:59 +0000 0xffffffffffffffff 0xffffffffffffffff 2147483647 "
             "proc(image):sub.sys [cat] " +
                 events[2].message + "\n");
+  EXPECT_EQ(modeOf(output), 0600U);
   EXPECT_EQ(diagnostics(), Texts());
   EXPECT_EQ(calls[2], "event handler") << "no filter without names";
 }
@@ -223,12 +237,19 @@ TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
   prepare = Prepare::succeeds;
   const auto unreadPipe = folder.path("pipe");
   ASSERT_EQ(mkfifo(unreadPipe.c_str(), 0600), 0);
-  for (const auto& path : {folder.path(""), folder.path("no/such"), unreadPipe}) {
+  const int sealed = memfd_create("", MFD_CLOEXEC | MFD_ALLOW_SEALING);
+  const auto onlyGrowing = "/proc/self/fd/" + std::to_string(sealed);
+  writeFile(onlyGrowing, "old");
+  ASSERT_EQ(fcntl(sealed, F_ADD_SEALS, F_SEAL_SHRINK), 0);
+  for (const auto& path : {folder.path(""), folder.path("no/such"), unreadPipe, onlyGrowing,
+                           output + std::string("\0cut", 4)}) {
     calls.clear();
-    output = path;
-    EXPECT_FALSE(put());
+    EXPECT_FALSE(OsLogStreamClock::put(60s, path));
     EXPECT_EQ(diagnostics(), Texts{"Failed to create file: " + path});
   }
+  EXPECT_EQ(readFile(onlyGrowing), "old");
+  EXPECT_NE(access(output.c_str(), F_OK), 0);
+  close(sealed);
 }
 
 TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
@@ -237,11 +258,19 @@ TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
   EXPECT_EQ(diagnostics(), Texts{"Invalid oslog stream: reason = 7"});
   thread.join();
   calls.clear();
-  output = "/dev/full";
   events.resize(3);
-  EXPECT_FALSE(put());
-  EXPECT_EQ(diagnostics(),
-            (Texts{"Failed to write file: /dev/full", "Invalid oslog stream: reason = 1"}));
+  for (const auto& [path, message, why] :
+       {std::array{"/dev/full", "m", "No space left on device"},
+        std::array{"/dev/null", "too long", "Cannot allocate memory"}}) {
+    calls.clear();
+    output = path;
+    events[0].message = message;
+    EXPECT_FALSE(put());
+    EXPECT_EQ(diagnostics(), (Texts{"Failed to write file: " + output + ": " + why,
+                                    "Invalid oslog stream: reason = 1"}));
+    invalidated = false;
+    thread.join();
+  }
 }
 
 TEST_F(OsLogStreamTest, GivesUpOnAStreamThatDoesNotEnd) {

@@ -6,7 +6,7 @@
 
 #include <cerrno>
 
-#include "platform/posix/Descriptor.h"
+#include "platform/posix/transfer.h"
 #include "platform/system.h"
 
 namespace platform {
@@ -16,36 +16,40 @@ class AppendedFile final : public FileHandle {
  public:
   explicit AppendedFile(posix::Descriptor opened) : descriptor(std::move(opened)) {}
 
-  bool write(std::string_view bytes) override {
-    ssize_t written = -1;
-    do {
-      written = ::write(descriptor.get(), bytes.data(), bytes.size());
-    } while (written < 0 && errno == EINTR);
-    return written >= 0 && static_cast<std::size_t>(written) == bytes.size();
+  std::error_code write(std::string_view bytes) override {
+    return posix::writeAll(descriptor.get(), bytes);
   }
 
  private:
   posix::Descriptor descriptor;
 };
 
-}  // namespace
-
-void createEmptyFile(const std::string& path) {
-  struct stat present {};
-  if (stat(path.c_str(), &present) == 0 && !S_ISREG(present.st_mode)) return;
-  if (posix::isReadByDevice(path)) return;
-  constexpr mode_t kForAll = 0666;  // less the process's file mode creation mask
-  const posix::Descriptor made(
-      open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, kForAll));
+/// Empties what is open, unless it is a device or a pipe. Emptied by the descriptor that is then
+/// written, since its path may lead elsewhere by now.
+bool empty(const posix::Descriptor& opened) {
+  struct stat about {};
+  if (fstat(opened.get(), &about) != 0) return false;
+  return !S_ISREG(about.st_mode) || ftruncate(opened.get(), 0) == 0;
 }
 
-std::unique_ptr<FileHandle> FileHandle::openForAppending(const std::string& path) {
+}  // namespace
+
+std::unique_ptr<FileHandle> FileHandle::createEmpty(const std::string& path) {
+  constexpr mode_t kForItsOwner = 0600;
   if (posix::isReadByDevice(path)) return nullptr;
-  // A pipe without a reader would block an open for writing, without end: O_NONBLOCK refuses it.
-  posix::Descriptor opened(open(path.c_str(), O_WRONLY | O_APPEND | O_NONBLOCK | O_CLOEXEC));
-  if (!opened) return nullptr;
-  fcntl(opened.get(), F_SETFL, O_APPEND);  // the writes themselves may block
+  auto opened = posix::openForAppending(path, kForItsOwner);
+  if (!opened || !empty(opened)) return nullptr;
   return std::make_unique<AppendedFile>(std::move(opened));
 }
 
 }  // namespace platform
+
+posix::Descriptor posix::openForAppending(const std::string& path, mode_t mode) {
+  if (path.find('\0') != std::string::npos) {  // the system would open another file
+    errno = EINVAL;
+    return Descriptor();
+  }
+  // Always with O_CREAT: the system then refuses what others have laid out in a sticky directory.
+  return Descriptor(
+      open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, mode));
+}

@@ -1,0 +1,43 @@
+#include "platform/posix/transfer.h"
+
+#include <poll.h>
+#include <unistd.h>
+
+#include <cerrno>
+
+namespace posix {
+namespace {
+
+/// Whether a call that has failed with `error` is worth another try, once `descriptor` is ready for
+/// `event`.
+bool isWorthRepeating(int error, int descriptor, short event) {
+  if (error == EINTR) return true;
+  if (error != EAGAIN) return false;
+  pollfd ready = {descriptor, event, 0};
+  return ::poll(&ready, 1, -1) > 0 || errno == EINTR;
+}
+
+}  // namespace
+
+std::error_code writeAll(int descriptor, std::string_view bytes) {
+  while (!bytes.empty()) {
+    const ssize_t written = ::write(descriptor, bytes.data(), bytes.size());
+    if (written > 0) {
+      bytes.remove_prefix(static_cast<std::size_t>(written));
+    } else if (const int error = written < 0 ? errno : ENOSPC;
+               !isWorthRepeating(error, descriptor, POLLOUT)) {
+      return {error, std::generic_category()};
+    }
+  }
+  return {};
+}
+
+std::size_t readSome(int descriptor, char* buffer, std::size_t size) {
+  for (;;) {
+    const ssize_t count = ::read(descriptor, buffer, size);
+    if (count >= 0) return static_cast<std::size_t>(count);
+    if (!isWorthRepeating(errno, descriptor, POLLIN)) return 0;
+  }
+}
+
+}  // namespace posix
