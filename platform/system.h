@@ -18,6 +18,11 @@ void runMainEventLoop();
 /// Makes the standard streams safe to use, before anything else is opened and while there is one
 /// thread: each that is closed becomes the null device, and a reader that goes away, or a limit to
 /// a file's size, costs the output and not the process.
+///
+/// From then on std::cin, std::cout and std::cerr share nothing with the C library's streams. They
+/// wait for a descriptor that does not block; what is written stays in a buffer until a flush, on
+/// std::cerr as well, and goes out in one system call where it fits; what cannot be written is
+/// dropped, and the stream goes on. Throws `std::bad_alloc`. Called once.
 void openStandardStreams();
 
 /// A file open for writing at its end; it closes when destroyed.

@@ -44,6 +44,9 @@ Program::Program(const Start& start) {
   int input[2];
   int output[2];
   if (pipe2(input, O_CLOEXEC) != 0 || pipe2(output, O_CLOEXEC) != 0) throw std::bad_alloc();
+  // As another program that shares them may have left them.
+  fcntl(input[0], F_SETFL, O_NONBLOCK);
+  fcntl(output[1], F_SETFL, O_NONBLOCK);
   process = start.onTerminal ? forkpty(&out, nullptr, &plain, nullptr) : fork();
   if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
   if (process == 0) execute(start, input[0], output[1]);

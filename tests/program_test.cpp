@@ -115,6 +115,19 @@ TEST(Program, FollowsTheServerWhileItPrompts) {
   EXPECT_EQ(std::ranges::count(outcome.requests, '\n'), 1);
 }
 
+TEST(Program, LosesNothingToASlowReader) {
+  constexpr int kLines = 2000;  // of help, far more than a pipe holds
+  const std::string prompt = "(/zubtool)>> ";
+  Program program({});
+  EXPECT_EQ(program.readUntil(prompt), prompt);
+  std::string lines;
+  for (int i = 0; i < kLines; ++i) lines += "help\n";
+  program.type(lines + "quit\n");
+  const auto outcome = program.finish();  // which reads a byte at a time
+  EXPECT_EQ(outcome.status, 0);
+  EXPECT_EQ(outcome.out.size(), kLines * (run({{"help"}}).out.size() + prompt.size()));
+}
+
 TEST(Program, ExportsTheLogOfARealMachine) {
   const ScratchFolder folder;
   const std::string data = ZUBTOOL_SOURCES "/tests/data/machine.";

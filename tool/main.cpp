@@ -29,7 +29,6 @@ int main(int argc, char** argv) {
     std::cout << why << std::endl;
     return kCannotStart;
   }
-  std::ios::sync_with_stdio(false);
   pthread_t shellThread{};
   if (const int failed = pthread_create(&shellThread, nullptr, runShellThread, &words)) {
     std::cerr << "Cannot start the shell thread: " << strerror(failed) << std::endl;

@@ -2,8 +2,73 @@
 #include <unistd.h>
 
 #include <csignal>
+#include <cstring>
+#include <iostream>
+#include <streambuf>
 
+#include "platform/posix/transfer.h"
 #include "platform/system.h"
+
+namespace {
+
+constexpr std::size_t kBufferSize = 8192;
+
+/// Reads a descriptor.
+class InputBuffer final : public std::streambuf {
+ public:
+  explicit InputBuffer(int source) : descriptor(source) {}
+
+ protected:
+  int_type underflow() override {
+    setg(buffer, buffer, buffer + posix::readSome(descriptor, buffer, sizeof buffer));
+    return gptr() == egptr() ? traits_type::eof() : traits_type::to_int_type(*gptr());
+  }
+
+ private:
+  const int descriptor;
+  char buffer[kBufferSize];
+};
+
+/// Writes to a descriptor what it is given until a flush, in one call where that fits. What cannot
+/// be written is dropped, and counts as written: the stream goes on.
+class OutputBuffer final : public std::streambuf {
+ public:
+  explicit OutputBuffer(int target) : descriptor(target) { setp(buffer, buffer + sizeof buffer); }
+
+ protected:
+  int_type overflow(int_type byte) override {
+    sync();
+    if (!traits_type::eq_int_type(byte, traits_type::eof())) {
+      sputc(traits_type::to_char_type(byte));
+    }
+    return traits_type::not_eof(byte);
+  }
+
+  std::streamsize xsputn(const char* text, std::streamsize size) override {
+    if (size > epptr() - pptr()) sync();
+    if (size > epptr() - pptr()) {
+      write({text, static_cast<std::size_t>(size)});
+    } else {
+      std::memcpy(pptr(), text, static_cast<std::size_t>(size));
+      pbump(static_cast<int>(size));
+    }
+    return size;
+  }
+
+  int sync() override {
+    write({pbase(), static_cast<std::size_t>(pptr() - pbase())});
+    setp(buffer, buffer + sizeof buffer);
+    return 0;
+  }
+
+ private:
+  void write(std::string_view bytes) { static_cast<void>(posix::writeAll(descriptor, bytes)); }
+
+  const int descriptor;
+  char buffer[kBufferSize];
+};
+
+}  // namespace
 
 void platform::openStandardStreams() {
   for (int stream = STDIN_FILENO; stream <= STDERR_FILENO; ++stream) {
@@ -11,4 +76,9 @@ void platform::openStandardStreams() {
   }
   signal(SIGPIPE, SIG_IGN);
   signal(SIGXFSZ, SIG_IGN);
+  // Never destroyed: other threads outlive exit, which flushes the output.
+  std::cin.rdbuf(new InputBuffer(STDIN_FILENO));
+  std::cout.rdbuf(new OutputBuffer(STDOUT_FILENO));
+  std::cerr.rdbuf(new OutputBuffer(STDERR_FILENO));
+  std::cerr.unsetf(std::ios::unitbuf);
 }
