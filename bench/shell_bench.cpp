@@ -60,7 +60,7 @@ void runOverPipes(const std::string& text, Program&& program) {
     }
   });
   std::cin.clear();
-  program();
+  static_cast<void>(program());
   std::cout.flush();
   dup2(terminal, STDOUT_FILENO);
   close(terminal);
@@ -80,7 +80,7 @@ void BM_ShellLines(benchmark::State& state) {
   std::string text;
   for (int i = 0; i < kLines; ++i) text += "back\n";
   bench::compare(
-      state, [&] { runOverPipes(text, [] { EmptyShell().run({"zubtool"}); }); },
+      state, [&] { runOverPipes(text, [] { return EmptyShell().run({"zubtool"}); }); },
       [&] { runOverPipes(text, bareLoop); });
 }
 BENCHMARK(BM_ShellLines)->UseManualTime()->Iterations(7)->Unit(benchmark::kMillisecond);

@@ -1,8 +1,24 @@
 #include "framework/CommandShell.h"
 
 #include <iostream>
+#include <limits>
+#include <new>
 
 #include "framework/WordList.h"
+
+namespace {
+
+/// Reads a line of standard input. False at its end. Throws `std::bad_alloc`, with the line passed
+/// over, when it does not fit into memory.
+bool ReadLine(std::string& line) {
+  if (std::getline(std::cin, line)) return true;
+  if (!std::cin.bad()) return false;
+  std::cin.clear();  // not the stream has failed, but the string
+  if (std::cin.ignore(std::numeric_limits<std::streamsize>::max(), '\n')) throw std::bad_alloc();
+  return false;
+}
+
+}  // namespace
 
 std::list<std::string> CommandShell::convertCmdArgsToList(int argc, const char* const* argv) {
   std::list<std::string> words;
@@ -20,14 +36,19 @@ bool CommandShell::run(std::list<std::string> words) {
   return runLines() != Outcome::failed;
 }
 
-/// Prompts and runs lines until one of them quits, or standard input ends, which is a failure.
+/// Prompts and runs lines until one of them quits, or standard input ends, which is a failure. A
+/// line for which there is too little memory is given up.
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
     currentCommand = promptCommand;
     std::cout << '(' << currentCommand->getHierarchy() << ")>> " << std::flush;
-    std::string line;
-    if (!std::getline(std::cin, line)) return Outcome::failed;
-    if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
+    try {
+      std::string line;
+      if (!ReadLine(line)) return Outcome::failed;
+      if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
+    } catch (const std::bad_alloc&) {
+      std::cerr << "Not enough memory for this line" << std::endl;
+    }
   }
 }
 

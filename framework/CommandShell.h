@@ -10,7 +10,7 @@
 /// that names the node where it stands.
 ///
 /// A subclass supplies the tree. Threads: one, on which every handler runs as well. It writes to
-/// standard output and reads standard input through the standard streams.
+/// standard output and error and reads standard input through the standard streams.
 class CommandShell {
  public:
   CommandShell() = default;
@@ -24,8 +24,9 @@ class CommandShell {
   /// Runs the command line `words`, the program's name at its back; called once. Without further
   /// words it prompts and runs line after line. Returns true when every command group of the
   /// command line succeeded, or "quit" or "exit" was typed; false when one failed, no tree could
-  /// be made, or standard input ended.
-  bool run(std::list<std::string> words);
+  /// be made, or standard input ended. A typed line for which there is too little memory is refused
+  /// on standard error; a command line is not, and throws `std::bad_alloc`.
+  [[nodiscard]] bool run(std::list<std::string> words);
 
  protected:
   /// Builds the tree and returns its root, or an empty pointer when it cannot be made. Called once,

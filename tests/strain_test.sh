@@ -91,6 +91,10 @@ expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$pro
 expect_status 0 "full standard output and error" sh -c '"$0" help >/dev/full 2>&1' "$program"
 expect_status 1 "a line of 100 MB" sh -c 'head -c 100000000 /dev/zero | tr "\0" a | "$0"' "$program"
 expect_status 1 "a line of 100,000 words" sh -c 'yes tel | head -n 100000 | tr "\n" " " | "$0"' "$program"
+for line in 'yes x | head -n 20000000 | tr "\n" " "' 'head -c 500000000 /dev/zero | tr "\0" a'; do
+  expect_status 0 "$line" sh -c "ulimit -v 600000; { $line; echo; echo quit; } | '$program'"
+  grep -qx 'Not enough memory for this line' err || fail "$line: not refused"
+done
 expect_status 0 "100,000 groups" "$program" $(yes 'help --' | head -n 50000)
 expect_status 1 "arbitrary bytes" sh -c 'head -c 1000000 "$0" | "$0"' "$program"
 
@@ -100,3 +104,15 @@ for signal in INT HUP; do
   ZUB_DEVICE=device expect_status $((128 + $(kill -l $signal))) "$signal" \
     bash -c '(sleep 1; kill -'$signal' $$) & exec "$0" logdump tel' "$program"
 done
+
+# However little memory there is, a start ends with a message and a status.
+ulimit -c 0
+: >errors
+for ((kib = 4096; kib < 65536; kib += 16)); do
+  ! grep -q 'shell thread' errors || break  # enough for the start itself
+  status=0
+  (ulimit -v $kib && exec "$program" bogus) >/dev/null 2>err || status=$?
+  [[ $status =~ ^(127|255)$ && -s err ]] || fail "with $kib KiB: status $status"  # 127: the loader's
+  cat err >>errors
+done
+grep -qx 'Cannot start: not enough memory' errors || fail "memory is never too little to start"
