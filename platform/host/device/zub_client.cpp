@@ -2,7 +2,9 @@
 
 #include <map>
 #include <mutex>
+#include <system_error>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "platform/host/device/Answers.h"
@@ -118,6 +120,7 @@ void startServer(const std::shared_ptr<Manager>& manager) {
 }
 
 constexpr std::int32_t kNoSuchRequest = -1;
+constexpr std::int32_t kNoThread = -2;
 
 TelephonyLumo::Result answerTraceProperty(const lumo::dict& request, lumo::object* reply) {
   const auto& device = host::device();
@@ -190,16 +193,26 @@ TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std
 void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request) {
   const auto arrival = arrive(*manager, command, request);
-  dispatch::block<void()> task = [arrival, command, request, completion = std::move(completion)] {
+  // Held in one place, from which the queue's task takes it: it is released there, after its call.
+  const auto held = std::make_shared<Completion>(std::move(completion));
+  const auto complete = [held](const TelephonyLumo::Result& result, const lumo::object& reply) {
+    std::exchange(*held, {})(result, reply);
+  };
+  const dispatch::block<void()> task = [=] {
     lumo::object reply;
     const auto result = answer(arrival, command, request, &reply);
-    completion(result, reply);
+    complete(result, reply);
   };
-  if (arrival.delay.count() == 0) return manager->queue.async(std::move(task));
-  std::thread([queue = manager->queue, delay = arrival.delay, task = std::move(task)]() mutable {
-    std::this_thread::sleep_for(delay);
-    queue.async(std::move(task));
-  }).detach();
+  if (arrival.delay.count() == 0) return manager->queue.async(task);
+  try {
+    std::thread([queue = manager->queue, delay = arrival.delay, task] {
+      std::this_thread::sleep_for(delay);
+      queue.async(task);
+    }).detach();
+  } catch (const std::system_error& failure) {
+    const TelephonyLumo::Result result = {kNoThread, failure.what()};
+    manager->queue.async([=] { complete(result, {}); });
+  }
 }
 
 }  // namespace client

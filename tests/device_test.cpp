@@ -1,0 +1,31 @@
+// The simulated device, and what it takes from this machine.
+
+#include <gtest/gtest.h>
+#include <pthread.h>
+
+#include "platform/host/device/Device.h"
+#include "platform/zub_client.h"
+
+namespace {
+
+TEST(Server, FailsADumpForWhichThereIsNoThread) {
+  host::device().dumpDelay = std::chrono::hours(1);
+  const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
+  const auto group = dispatch::group::create();
+  std::int32_t code = 0;
+  zub::client::Completion completion = [&code, member = dispatch::membership(group)](
+                                           const TelephonyLumo::Result& result,
+                                           const lumo::object&) { code = result.code; };
+  pthread_attr_t before{};
+  pthread_getattr_default_np(&before);
+  pthread_attr_t huge{};
+  pthread_attr_init(&huge);
+  pthread_attr_setstacksize(&huge, std::size_t{1} << 46);
+  ASSERT_EQ(pthread_setattr_default_np(&huge), 0);
+  zub::client::PerformCommand(manager, zub::kCommandTraceDumpState, std::move(completion), {});
+  pthread_setattr_default_np(&before);
+  EXPECT_TRUE(group.wait(std::chrono::seconds(60)));
+  EXPECT_NE(code, 0);
+}
+
+}  // namespace
