@@ -2,11 +2,29 @@
 
 #include <gtest/gtest.h>
 #include <pthread.h>
+#include <sys/stat.h>
 
 #include "platform/host/device/Device.h"
+#include "platform/host/device/RequestLog.h"
 #include "platform/zub_client.h"
+#include "tests/Program.h"
 
 namespace {
+
+TEST(RequestLog, SaysWhyItCannotBeWritten) {
+  const ScratchFolder folder;
+  const auto unreadPipe = folder.path("pipe");
+  ASSERT_EQ(mkfifo(unreadPipe.c_str(), 0600), 0);
+  for (const auto& [path, why] : {std::pair(unreadPipe, "No such device or address"),
+                                  {folder.path("no/such"), "No such file or directory"},
+                                  {std::string("/dev/full"), "No space left on device"}}) {
+    host::device().requestLog = path;
+    testing::internal::CaptureStderr();
+    host::recordRequest("request");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              path + ": cannot write the request log: " + why + "\n");
+  }
+}
 
 TEST(Server, FailsADumpForWhichThereIsNoThread) {
   host::device().dumpDelay = std::chrono::hours(1);

@@ -1,13 +1,13 @@
 #include "platform/host/device/RequestLog.h"
 
-#include <fcntl.h>
 #include <unistd.h>
 
 #include <cerrno>
-#include <cstdio>
-#include <cstring>
+#include <system_error>
 
 #include "platform/host/device/Device.h"
+#include "platform/posix/files.h"
+#include "platform/posix/transfer.h"
 
 namespace host {
 namespace {
@@ -30,6 +30,13 @@ std::string describe(const lumo::object& value) {
   return "null";
 }
 
+std::error_code appendLine(const std::string& path, const std::string& line) {
+  constexpr mode_t kForAll = 0666;  // less the process's file mode creation mask
+  const auto log = posix::openForAppending(path, kForAll);
+  if (!log) return {errno, std::generic_category()};
+  return posix::writeAll(log.get(), line + '\n');  // at once: lines of several processes never mix
+}
+
 }  // namespace
 
 std::string describe(const lumo::dict& request) {
@@ -43,14 +50,10 @@ std::string describe(const lumo::dict& request) {
 void recordRequest(const std::string& line) {
   const auto& path = device().requestLog;
   if (path.empty()) return;
-  const int log = open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
-  const std::string whole = line + '\n';
-  errno = ENOSPC;  // what a write that is cut short says nothing of
-  // One write each, so that lines of several processes never mix.
-  if (log < 0 || write(log, whole.data(), whole.size()) != static_cast<ssize_t>(whole.size())) {
-    std::fprintf(stderr, "%s: cannot write the request log: %s\n", path.c_str(), strerror(errno));
-  }
-  if (log >= 0) close(log);
+  const auto failure = appendLine(path, line);
+  if (!failure) return;
+  const auto why = path + ": cannot write the request log: " + failure.message() + "\n";
+  static_cast<void>(posix::writeAll(STDERR_FILENO, why));
 }
 
 }  // namespace host
