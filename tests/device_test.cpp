@@ -2,14 +2,38 @@
 
 #include <gtest/gtest.h>
 #include <pthread.h>
+#include <sys/prctl.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
 
 #include "platform/host/device/Device.h"
 #include "platform/host/device/RequestLog.h"
+#include "platform/telephony.h"
 #include "platform/zub_client.h"
 #include "tests/Program.h"
 
 namespace {
+
+TEST(Processes, RunUntilTheyEndAndNotUntilTheyAreReaped) {
+  host::device().hostProcesses = true;
+  const auto name = "x) Z (y";
+  const pid_t process = fork();
+  if (process == 0) {
+    prctl(PR_SET_NAME, name);
+    raise(SIGSTOP);
+    _exit(0);
+  }
+  waitpid(process, nullptr, WUNTRACED);
+  EXPECT_TRUE(tlu::isProcessRunning(name));
+  kill(process, SIGCONT);
+  siginfo_t ended{};
+  waitid(P_PID, static_cast<id_t>(process), &ended, WEXITED | WNOWAIT);
+  EXPECT_FALSE(tlu::isProcessRunning(name));
+  waitpid(process, nullptr, 0);
+}
 
 TEST(RequestLog, SaysWhyItCannotBeWritten) {
   const ScratchFolder folder;

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
+#include <optional>
 
 #include "platform/host/ProcessName.h"
 #include "platform/host/device/Device.h"
@@ -19,16 +20,27 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Whether a process of this machine has that name; see proc(5) for what the files hold.
+/// What proc(5) says of the process with that folder: "PID (NAME) STATE ...", where the name may
+/// hold anything. Its name, or nothing when it has ended and only waits to be reaped.
+std::optional<std::string> nameOfRunning(const fs::path& process) {
+  std::string stat;
+  std::getline(std::ifstream(process / "stat"), stat, '\0');
+  const auto start = stat.find('(') + 1;
+  const auto end = stat.rfind(") ");
+  if (start == 0 || end == std::string::npos) return std::nullopt;
+  constexpr std::string_view kEnded = "ZXx";
+  if (kEnded.find(stat[end + 2]) != std::string_view::npos) return std::nullopt;
+  std::error_code hidden;  // the program file of another user's process
+  const auto program = fs::read_symlink(process / "exe", hidden).string();
+  return std::string(host::processName(std::string_view(stat).substr(start, end - start), program));
+}
+
+/// Whether a process of this machine has that name.
 bool runsOnThisMachine(const std::string& name) {
   std::error_code failed;
   for (fs::directory_iterator entry("/proc", failed), end; !failed && entry != end;
        entry.increment(failed)) {
-    std::string comm;
-    if (!std::getline(std::ifstream(entry->path() / "comm"), comm)) continue;
-    std::error_code hidden;  // the program file of another user's process
-    const auto program = fs::read_symlink(entry->path() / "exe", hidden).string();
-    if (host::processName(comm, program) == name) return true;
+    if (nameOfRunning(entry->path()) == name) return true;
   }
   return false;
 }
