@@ -18,7 +18,7 @@ std::optional<std::string> parse(std::string_view text, Profile& profile) {
 TEST(Profile, TakesWhatAPersonWouldWrite) {
   Profile profile;
   const auto wrong = parse(
-      "# a comment, then a blank line\r\n\n"
+      "\xEF\xBB\xBF# a byte order mark and a comment, then a blank line\r\n\n"
       "radio=0x10 # another\n product = Watch3Large\nradio-vendor = -2\r\n"
       "processes = modemd\t @host  x\nserver = 0 Started, 250 Shutting down ,250 Off\n"
       "system-logs-mode =\nbaseband-enabled = !0xE020E001\ndump = !-1\ndump-timestamp =\n"

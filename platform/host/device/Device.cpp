@@ -1,10 +1,13 @@
 #include "platform/host/device/Device.h"
 
+#include <unistd.h>
+
 #include <cerrno>
-#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
+
+#include "platform/posix/transfer.h"
 
 namespace host {
 namespace {
@@ -13,7 +16,7 @@ constexpr int kBadProfile = 255;
 constexpr std::size_t kLargestProfile = 1 << 20;
 
 [[noreturn]] void refuse(const std::string& why) {
-  std::fprintf(stderr, "%s\n", why.c_str());
+  static_cast<void>(posix::writeAll(STDERR_FILENO, why + "\n"));
   std::exit(kBadProfile);
 }
 

@@ -68,8 +68,14 @@ bool readMilliseconds(std::string_view text, std::chrono::milliseconds& duration
 bool readFault(std::string_view text, Answer& answer) {
   if (!text.starts_with('!')) return false;
   text.remove_prefix(1);
-  if (text == "null") return answer = {.kind = Answer::Kind::nullReply}, true;
-  if (text == "empty") return answer = {.kind = Answer::Kind::emptyReply}, true;
+  if (text == "null") {
+    answer = {.kind = Answer::Kind::nullReply};
+    return true;
+  }
+  if (text == "empty") {
+    answer = {.kind = Answer::Kind::emptyReply};
+    return true;
+  }
   std::int64_t code = 0;
   if (!readNumber(text, code) || code == 0 || code < std::numeric_limits<std::int32_t>::min() ||
       code > std::numeric_limits<std::uint32_t>::max()) {
@@ -157,10 +163,12 @@ bool readServer(std::string_view text, std::vector<ServerStep>& steps) {
 }
 
 bool readLogEnd(std::string_view text, std::optional<unsigned long>& reason) {
-  unsigned long read = 0;
-  if (text == "never") return reason.reset(), true;
-  if (!readNumber(text, read)) return false;
-  reason = read;
+  reason.reset();
+  return text == "never" || readNumber(text, reason.emplace());
+}
+
+bool readText(std::string_view text, std::string& value) {
+  value = text;
   return true;
 }
 
@@ -225,10 +233,10 @@ constexpr Key kKeys[] = {
      }},
     {"helper-timestamp", "a text",
      [](Text t, Profile& p) { return readTimestamp(t, p.helperTimestamp); }, true},
-    {"request-log", "a path", [](Text t, Profile& p) { return p.requestLog = t, true; }},
-    {"log", "sample, journal or a path", [](Text t, Profile& p) { return p.log = t, true; }},
+    {"request-log", "a path", [](Text t, Profile& p) { return readText(t, p.requestLog); }},
+    {"log", "sample, journal or a path", [](Text t, Profile& p) { return readText(t, p.log); }},
     {"log-prepare", "ok or a text",
-     [](Text t, Profile& p) { return p.logPrepareError = t == "ok" ? Text() : t, true; }},
+     [](Text t, Profile& p) { return readText(t == "ok" ? Text() : t, p.logPrepareError); }},
     {"log-end", "a whole number or never",
      [](Text t, Profile& p) { return readLogEnd(t, p.logEnd); }},
 };
@@ -239,6 +247,7 @@ std::string quoted(std::string_view text) { return std::string("'").append(text)
 std::string readLine(std::string_view line, Profile& profile,
                      std::map<std::string_view, int>& firstLines, int number) {
   if (!posix::isUtf8(line)) return "not UTF-8 text";
+  if (line.find('\0') != Text::npos) return "a NUL byte, which no text holds";
   line = trimmed(line.substr(0, line.find('#')));
   if (line.empty()) return {};
   const auto equals = line.find('=');
@@ -259,6 +268,8 @@ std::string readLine(std::string_view line, Profile& profile,
 
 std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
                                         Profile& profile) {
+  constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
+  if (text.starts_with(kByteOrderMark)) text.remove_prefix(kByteOrderMark.size());
   std::map<std::string_view, int> firstLines;
   for (int number = 1; !text.empty(); ++number) {
     const auto wrong = readLine(takePiece(text, '\n'), profile, firstLines, number);
