@@ -59,7 +59,8 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   /// Runs the handler called `name` on this thread and returns its result, once all the work that
   /// it put on its task group has ended; there is no time-out. Without such a handler, or without
   /// the memory for a group, it does nothing and returns false.
-  bool execCommand(const std::string& name, const std::list<std::string>& words) const;
+  [[nodiscard]] bool execCommand(const std::string& name,
+                                 const std::list<std::string>& words) const;
 
   /// The path of names from the root, each after a "/"; empty before `init`.
   std::string getHierarchy() const { return hierarchy; }

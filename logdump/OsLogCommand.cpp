@@ -30,14 +30,17 @@ double ReadSeconds(const std::string& word) {
 
 /// Sorts the words after "-p" and "-i"; words after any other option are dropped.
 void ParseSelection(Words words, Words& processes, Words& imagePaths) {
-  Words dropped;
-  Words* chosen = &dropped;
+  Words* chosen = nullptr;
   while (!words.empty()) {
     auto word = TakeNextWord(words);
-    if (!word.starts_with('-')) {
+    if (word == "-p") {
+      chosen = &processes;
+    } else if (word == "-i") {
+      chosen = &imagePaths;
+    } else if (word.starts_with('-')) {
+      chosen = nullptr;
+    } else if (chosen) {
       chosen->push_back(std::move(word));
-    } else {
-      chosen = word == "-p" ? &processes : word == "-i" ? &imagePaths : &dropped;
     }
   }
 }

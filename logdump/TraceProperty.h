@@ -7,7 +7,8 @@
 /// Readings of the text value of a trace property.
 ///
 /// A value is one of the words false, off, no, true, on, yes, full and lite, in any case, or a
-/// number as std::stol reads it with base 0, all of the text. Pure functions, any thread.
+/// whole number, all of the text: white space, a sign, and then digits, hexadecimal after 0x or 0X,
+/// octal after 0, else decimal. Pure functions, any thread.
 
 /// The mode of a trace: 0 off, 1 on or full, 2 lite, or any other signed 32-bit number; none for
 /// any other text.

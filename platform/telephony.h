@@ -6,10 +6,10 @@
 
 /// The telephony utility library: what device this is, and a few tools of the telephony stack.
 ///
-/// Threads: every function may be called from any thread. None of them fails: what a device does
-/// not know is 0 or false.
+/// Threads: every function may be called from any thread. None of them fails: a code that a device
+/// does not know is 0, any other answer false.
 
-/// The product enumeration: what `TelephonyRadiosGetProduct` returns.
+/// The products that the tool knows by name. The codes are those of the device's services.
 enum class TelephonyProduct : int {
   Unknown = 0,
   Phone = 1,
@@ -35,13 +35,13 @@ enum class TelephonyProduct : int {
 /// The radio vendor of the KOV family; every other vendor code is of the ZAT family.
 inline constexpr int kTelephonyRadioVendorKOV = 2;
 
-/// The product's cellular radio; 0 when it has none.
+/// The code of the product's cellular radio; 0 when it has none.
 int TelephonyRadiosGetRadio();
 
-/// The product's code, usually one of `TelephonyProduct`.
+/// The product's code: one of `TelephonyProduct`, or that of another product.
 int TelephonyRadiosGetProduct();
 
-/// The vendor of the radio.
+/// The code of the radio's vendor.
 int TelephonyRadiosGetRadioVendor();
 
 /// Whether the radio's diagnostic interface can trace over QDSS, the high-throughput path.
