@@ -72,10 +72,18 @@ void Program::execute(const Start& start, int input, int output) const {
   if (int ends[2]; start.readerGone && pipe2(ends, O_CLOEXEC) == 0) dup2(ends[1], STDOUT_FILENO);
   setenv("TZ", "UTC", 1);
   setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
-  std::vector<char*> arguments = {const_cast<char*>(start.name.c_str())};
-  for (const auto& word : start.words) arguments.push_back(const_cast<char*>(word.c_str()));
+  std::vector<std::string> command = {ZUBTOOL_EMULATOR};
+  const bool isEmulated = !command.front().empty();
+  if (isEmulated) {
+    command.insert(command.end(), {"-0", start.name, ZUBTOOL_PROGRAM});  // options of qemu-user
+  } else {
+    command.front() = start.name;
+  }
+  command.insert(command.end(), start.words.begin(), start.words.end());
+  std::vector<char*> arguments;
+  for (auto& word : command) arguments.push_back(word.data());
   arguments.push_back(nullptr);
-  execv(ZUBTOOL_PROGRAM, arguments.data());
+  execvp(isEmulated ? arguments.front() : ZUBTOOL_PROGRAM, arguments.data());
   _exit(127);
 }
 

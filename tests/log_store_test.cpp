@@ -3,11 +3,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <cmath>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <limits>
 #include <map>
 #include <new>
 #include <random>
@@ -169,34 +167,6 @@ TEST(Text, FoldingIgnoresCaseAndDiacritics) {
   for (const auto& row : readTable("folding", 3)) {
     EXPECT_EQ(host::FoldedText(row[0]).isIn(row[1]), row[2] == "true") << row[0];
   }
-}
-
-TEST(Text, DatesHaveTheirDefaultForm) {
-  using Limits = std::numeric_limits<std::int64_t>;
-  for (const auto& row : readTable("dates", 2)) {
-    std::string text;
-    OSLogDate(std::stoll(row[0])).appendDescription(text);
-    EXPECT_EQ(text, row[1]);
-  }
-  const OSLogDate date(5);
-  EXPECT_EQ(date.addingSeconds(-0.29), OSLogDate(5 - 290'000));
-  EXPECT_EQ(date.addingSeconds(std::nan("")), date);
-  EXPECT_EQ(date.addingSeconds(INFINITY), OSLogDate(Limits::max()));
-  EXPECT_EQ(date.addingSeconds(0x1p63 / 1e6), OSLogDate(Limits::max()));
-  EXPECT_EQ(OSLogDate(Limits::min()).addingSeconds(-1), OSLogDate(Limits::min()));
-}
-
-TEST(Text, TheLocalZoneHasItsSummerTime) {
-  setenv("TZ", "CET-1CEST,M3.5.0,M10.5.0/3", 1);
-  tzset();
-  std::thread([] {  // one that has not asked before
-    const OSLogTimeZone local;
-    EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'846'799'999'999)), 3'600);
-    EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'846'800'000'000)), 7'200);
-  })
-      .join();
-  unsetenv("TZ");
-  tzset();
 }
 
 /// What a stream has delivered: the summaries, and the reason of its end.

@@ -1,0 +1,99 @@
+// The client libraries of the server and of the helper service. Nothing here makes the device
+// collect or reset anything.
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <thread>
+
+#include "platform/zub_client.h"
+#include "platform/zub_helper.h"
+
+using namespace std::chrono_literals;
+
+namespace {
+
+class Client : public testing::Test {
+ protected:
+  Client() {
+    const auto asked = dispatch::group::create();
+    queue.async(
+        [this, member = dispatch::membership(asked)] { thread = std::this_thread::get_id(); });
+    asked.wait();
+  }
+
+  const dispatch::queue queue = dispatch::queue("contract");
+  std::thread::id thread;  ///< the queue's
+  const std::shared_ptr<zub::client::Manager> manager =
+      zub::client::CreateManager("contract", queue);
+};
+
+/// A request that only asks: for a property of a trace.
+lumo::dict propertyRequest(const char* property) {
+  lumo::dict request;
+  request.set(zub::kKeyTraceName, zub::kTraceSystemLogs);
+  request.set(zub::kKeyTracePropertyName, property);
+  return request;
+}
+
+TEST_F(Client, CompletesOnceOnTheQueueAndReleasesTheCompletionBeforeTheNextTask) {
+  for (const char* property : {zub::kKeyTraceMode, "none"}) {
+    const auto answered = dispatch::group::create();
+    int calls = 0;
+    auto owned = std::make_shared<int>();
+    const std::weak_ptr<int> completion(owned);
+    zub::client::PerformCommand(
+        manager, zub::kCommandGetTraceProperty,
+        [&, owned = std::move(owned), member = dispatch::membership(answered)](const auto& result,
+                                                                               const auto& reply) {
+          ++calls;
+          EXPECT_EQ(std::this_thread::get_id(), thread);
+          EXPECT_TRUE(result.code == 0 || !reply.isDict()) << result.message;
+          queue.async([&completion, member] { EXPECT_TRUE(completion.expired()); });
+        },
+        propertyRequest(property));
+    ASSERT_TRUE(answered.wait(60s));
+    EXPECT_EQ(calls, 1);
+  }
+}
+
+TEST_F(Client, LeavesTheReplyNullWhereARequestFails) {
+  lumo::object reply;
+  const auto result = zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty,
+                                                  propertyRequest("none"), &reply);
+  EXPECT_NE(result.code, 0);
+  EXPECT_FALSE(reply.isDict());
+}
+
+TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
+  struct Seen {
+    dispatch::group reported = dispatch::group::create();
+    std::atomic<bool> open = true;
+    std::atomic<std::thread::id> thread;
+  };
+  const auto seen = std::make_shared<Seen>();
+  seen->reported.enter();
+  zub::client::EventsOff(manager);
+  zub::client::RegisterEventHandler(
+      manager, zub::kEventServerStateChange, [seen](const lumo::object& payload, const auto&) {
+        EXPECT_TRUE(!payload.isDict() || payload.get(zub::kKeyServerState).as<std::string>());
+        seen->thread = std::this_thread::get_id();
+        if (seen->open.exchange(false)) seen->reported.leave();
+      });
+  zub::client::EventsOn(manager);
+  EXPECT_GT(seen.use_count(), 1);  // the handler is kept
+  if (!seen->reported.wait(1s)) GTEST_SKIP() << "the server reports no state";
+  EXPECT_EQ(seen->thread.load(), thread);
+}
+
+TEST(Helper, LeavesTheReplyEmptyWhereATaskFails) {
+  const auto helper = zub::HelperClient::create("contract", nullptr);
+  if (!helper) GTEST_SKIP() << "the helper service is not there";
+  lumo::object reply = lumo::dict();
+  const auto result = helper->perform(4, "none", {}, &reply);
+  if (result.code == 0) GTEST_SKIP() << "the helper service takes any command";
+  ASSERT_TRUE(reply.isDict());
+  EXPECT_TRUE(reply.as<lumo::dict>()->entries().empty());
+}
+
+}  // namespace

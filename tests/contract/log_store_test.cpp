@@ -1,0 +1,128 @@
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <atomic>
+#include <functional>
+#include <stdexcept>
+#include <thread>
+
+#include "platform/oslog_store.h"
+
+using namespace std::chrono_literals;
+
+namespace {
+
+struct Event {
+  OSLogDate date;
+  std::string process;
+  std::string message;
+};
+
+class LogStore : public testing::Test {
+ protected:
+  void SetUp() override {
+    int calls = 0;
+    OSLogEventStore::localStore()->prepareWithCompletionHandler(
+        [&](std::shared_ptr<OSLogEventSource> prepared, const std::optional<std::string>& why) {
+          ++calls;
+          source = std::move(prepared);
+          EXPECT_EQ(source == nullptr, why.has_value());
+          error = why.value_or("");
+        });
+    ASSERT_EQ(calls, 1) << "the completion runs before prepare returns";
+    if (source == nullptr) GTEST_SKIP() << error;
+    stream = OSLogEventStream::initWithSource(source);
+    ASSERT_NE(stream, nullptr);
+  }
+
+  /// Runs the stream and calls `each` with every event, until there are no more or `each` has seen
+  /// what a log of any length has enough of.
+  std::vector<Event> run(OSLogDate from, const std::function<void()>& each = nullptr) {
+    std::vector<Event> events;
+    const auto ended = dispatch::group::create();
+    auto owned = std::make_shared<int>(0);
+    const std::weak_ptr<int> handler(owned);
+    stream->setEventHandler([&, owned = std::move(owned)](const OSLogEventProxy& event) {
+      EXPECT_GE(event.date(), from);
+      if (each) each();
+      if (events.size() == kMost) return stream->invalidate();
+      events.push_back(
+          {event.date(), std::string(event.process()), std::string(event.composedMessage())});
+    });
+    stream->setInvalidationHandler(
+        [&, member = dispatch::membership(ended)](unsigned long, const auto&) {
+          ++ends;
+          EXPECT_TRUE(handler.expired()) << "the event handler is released before the end";
+        });
+    stream->activateStreamFromDate(from);
+    stream->setInvalidationHandler(nullptr);
+    EXPECT_TRUE(ended.wait(60s));
+    EXPECT_EQ(ends, 1);
+    return events;
+  }
+
+  void renew() {
+    stream = OSLogEventStream::initWithSource(source);
+    ends = 0;
+  }
+
+  static constexpr std::size_t kMost = 1000;
+  const OSLogDate tenMinutesAgo = OSLogDate::now().addingSeconds(-600);
+  std::string error;
+  std::shared_ptr<OSLogEventSource> source;
+  std::shared_ptr<OSLogEventStream> stream;
+  std::atomic<int> ends = 0;
+};
+
+TEST_F(LogStore, DeliversTheEventsInTheirOrderFromTheDateOn) {
+  auto all = run(tenMinutesAgo);
+  if (all.empty()) GTEST_SKIP() << "nothing has been logged for ten minutes";
+  const OSLogDate middle = all[all.size() / 2].date;
+  std::erase_if(all, [middle](const Event& event) { return event.date < middle; });
+  renew();
+  const auto later = run(middle);
+  ASSERT_GE(later.size(), all.size());
+  for (std::size_t i = 0; i < all.size(); ++i) EXPECT_EQ(later[i].message, all[i].message);
+}
+
+TEST_F(LogStore, DeliversWhatAnyTermOfTheFilterLetsPass) {
+  const auto all = run(tenMinutesAgo);
+  if (all.empty()) GTEST_SKIP() << "nothing has been logged for ten minutes";
+  const auto wanted = all.back().process;
+  renew();
+  stream->setFilterPredicate({{{"process == %@", "none"}, {"process == %@", wanted}}});
+  const auto some = run(tenMinutesAgo);
+  EXPECT_GE(some.size(),
+            static_cast<std::size_t>(std::ranges::count(all, wanted, &Event::process)));
+  EXPECT_TRUE(std::ranges::all_of(some, [&](const auto& one) { return one.process == wanted; }));
+  renew();
+  stream->setFilterPredicate({});
+  EXPECT_TRUE(run(tenMinutesAgo).empty()) << "no term is true";
+  renew();
+  EXPECT_THROW(stream->setFilterPredicate({{{"pid == %@", "1"}}}), std::invalid_argument);
+}
+
+TEST_F(LogStore, IsInvalidatedFromAnywhere) {
+  run(tenMinutesAgo, [this] {
+    stream->invalidate();  // from its own thread, again and again
+    EXPECT_EQ(ends, 0);
+  });
+  stream->invalidate();  // after its end
+  renew();
+  stream->invalidate();
+  EXPECT_TRUE(run(tenMinutesAgo).empty()) << "invalidated before it was activated";
+  renew();
+  std::thread other([this] { stream->invalidate(); });
+  run(tenMinutesAgo);
+  other.join();
+}
+
+TEST_F(LogStore, RunsToItsEndWhenItsMakerReleasesIt) {
+  const auto ended = dispatch::group::create();
+  stream->setInvalidationHandler([member = dispatch::membership(ended)](auto, const auto&) {});
+  stream->activateStreamFromDate(tenMinutesAgo);
+  stream.reset();
+  EXPECT_TRUE(ended.wait(60s));
+}
+
+}  // namespace

@@ -1,0 +1,54 @@
+#include "platform/system.h"
+
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+
+#include <fstream>
+
+#include "platform/telephony.h"
+#include "tests/Program.h"
+
+namespace {
+
+TEST(System, TheProgramsNameHasNoFolder) {
+  EXPECT_EQ(std::string_view(getprogname()), "zub_contract_tests");
+}
+
+TEST(Files, AreEmptiedThenAppendedTo) {
+  const ScratchFolder folder;
+  const auto path = folder.path("file");
+  for (int round = 0; round < 2; ++round) {
+    const auto file = platform::FileHandle::createEmpty(path);
+    ASSERT_TRUE(file);
+    EXPECT_EQ(readFile(path), "");
+    EXPECT_FALSE(file->write("one,"));
+    std::ofstream(path, std::ios::app) << "two,";
+    EXPECT_FALSE(file->write(std::string("\0three", 6)));
+    EXPECT_EQ(readFile(path), std::string("one,two,\0three", 14));
+  }
+}
+
+TEST(Files, OfOtherKindsAreLeftAsTheyAre) {
+  const ScratchFolder folder;
+  const auto pipe = folder.path("pipe");
+  ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+  EXPECT_EQ(platform::FileHandle::createEmpty(pipe), nullptr) << "nobody reads it";
+  EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("")), nullptr) << "a folder";
+  const auto full = platform::FileHandle::createEmpty("/dev/full");
+  if (!full) GTEST_SKIP() << "no /dev/full";
+  EXPECT_EQ(full->write("bytes"), std::errc::no_space_on_device);
+}
+
+TEST(Text, IsComparedWithoutTheCaseOfAsciiLetters) {
+  const struct {
+    const char* left;
+    const char* right;
+    bool equal;
+  } cases[] = {{"", "", true},       {"AZaz09", "azAZ09", true}, {"tar", "tar.gz", false},
+               {"tar", "ta", false}, {"@[`{", "`{@[", false},    {"\xc3\x84", "\xc3\xa4", false}};
+  for (const auto& one : cases) {
+    EXPECT_EQ(util::equal_nocase(one.left, one.right), one.equal) << one.left;
+  }
+}
+
+}  // namespace
