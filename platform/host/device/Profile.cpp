@@ -98,8 +98,7 @@ bool readTextOrFault(std::string_view text, Answer& answer) {
 }
 
 bool readTimestamp(std::string_view text, std::optional<std::string>& timestamp) {
-  timestamp.reset();
-  if (text != "now") timestamp = text;
+  timestamp = text == "now" ? std::nullopt : std::optional<std::string>(text);
   return true;
 }
 
