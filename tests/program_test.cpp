@@ -146,7 +146,8 @@ TEST(Program, ExportsTheLogOfARealMachine) {
 TEST(Program, EndsWhenTheShellThreadCannotStart) {
   rlimit before{};
   ASSERT_EQ(getrlimit(RLIMIT_STACK, &before), 0);
-  const rlimit huge = {1UL << 46, before.rlim_max};  // a thread's stack has this size by default
+  const rlim_t size = sizeof(void*) == 8 ? rlim_t{1} << 46 : 0xF0000000;  // of a thread's stack
+  const rlimit huge = {size, before.rlim_max};
   if (setrlimit(RLIMIT_STACK, &huge) != 0) GTEST_SKIP() << "the stack's limit is fixed";
   const auto outcome = run({{"help"}});
   setrlimit(RLIMIT_STACK, &before);
