@@ -127,7 +127,7 @@ for shell in bash zsh fish; do
   if command -v "$shell" >/dev/null; then
     check_completion "$shell"
   else
-    echo "docs_test: no $shell here to try its completion" >&2
+    echo "not run: the completion for $shell: it is not installed"
   fi
 done
 check_words
