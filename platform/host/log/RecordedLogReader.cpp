@@ -131,7 +131,7 @@ bool RecordedLogReader::readBinary(Field field) {
   if (!readLength(length)) return false;
   if (field != Field::none && length > kMaxField) damagedBy("a field is too long");
   if (length < rest()) {
-    take(field, length);
+    take(field, static_cast<std::size_t>(length));
   } else {
     startPieces(field);
     while (length >= rest()) {
@@ -139,7 +139,7 @@ bool RecordedLogReader::readBinary(Field field) {
       takePiece(field, rest());
       if (!refill()) return false;
     }
-    takePiece(field, length);
+    takePiece(field, static_cast<std::size_t>(length));
     endPieces(field);
   }
   if (*position != '\n') damagedBy("no newline behind a binary field");
