@@ -59,6 +59,10 @@ class membership {
   group joined;
 };
 
+/// Can be called with `Arguments`, for a `Result`.
+template <class Callable, class Result, class... Arguments>
+concept callable_as = std::is_invocable_r_v<Result, Callable&, Arguments...>;
+
 /// A reference-counted callable, which may hold none: one made of a null pointer or of an empty
 /// `std::function` is empty.
 ///
@@ -75,9 +79,8 @@ class block<Result(Arguments...)> {
   block() = default;
   block(std::nullptr_t) {}
 
-  template <class Callable>
-  requires(!std::is_same_v<Callable, block> &&
-           std::is_invocable_r_v<Result, Callable&, Arguments...>) block(Callable callable) {
+  template <callable_as<Result, Arguments...> Callable>
+  block(Callable callable) {
     std::function<Result(Arguments...)> function(std::move(callable));
     if (function) body = std::make_shared<decltype(function)>(std::move(function));
   }

@@ -160,7 +160,7 @@ class OsLogStreamTest : public ::testing::Test, public Script {
 using Texts = std::vector<std::string>;
 
 unsigned modeOf(const std::string& path) {
-  struct stat about {};
+  struct stat about = {};
   stat(path.c_str(), &about);
   return about.st_mode & 0777;
 }

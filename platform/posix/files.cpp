@@ -27,7 +27,7 @@ class AppendedFile final : public FileHandle {
 /// Empties what is open, unless it is a device or a pipe. Emptied by the descriptor that is then
 /// written, since its path may lead elsewhere by now.
 bool empty(const posix::Descriptor& opened) {
-  struct stat about {};
+  struct stat about = {};
   if (fstat(opened.get(), &about) != 0) return false;
   return !S_ISREG(about.st_mode) || ftruncate(opened.get(), 0) == 0;
 }

@@ -16,7 +16,7 @@ namespace {
 constinit thread_local JournalFaults* ofThisThread = nullptr;
 std::mutex mutex;  ///< of `users`
 int users = 0;
-struct sigaction before {};
+struct sigaction before = {};
 
 /// Reads /proc/self/maps (see proc(5)) byte by byte, with nothing but system calls.
 class MapsFile {
@@ -99,7 +99,7 @@ JournalFaults::JournalFaults() : outer(ofThisThread) {
   ofThisThread = this;
   const std::lock_guard lock(mutex);
   if (users++ > 0) return;
-  struct sigaction ours {};
+  struct sigaction ours = {};
   ours.sa_sigaction = handle;
   ours.sa_flags = SA_SIGINFO | SA_ONSTACK;
   sigfillset(&ours.sa_mask);

@@ -113,7 +113,7 @@ struct Identity {
 };
 
 std::optional<Identity> identityOf(const fs::path& path) {
-  struct stat about {};
+  struct stat about = {};
   if (::stat(path.c_str(), &about) != 0) return std::nullopt;
   return Identity(about);
 }
@@ -123,7 +123,7 @@ using Identities = std::vector<Identity>;
 Identities identitiesOf(const std::vector<JournalFile>& files) {
   Identities identities;
   for (const JournalFile& file : files) {
-    struct stat about {};
+    struct stat about = {};
     if (::fstat(file.descriptor.get(), &about) == 0) identities.emplace_back(about);
   }
   std::ranges::sort(identities);

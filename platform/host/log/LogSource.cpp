@@ -121,7 +121,7 @@ std::shared_ptr<LogSource> prepareLog(const std::string& log) {
   if (log == "journal") return std::make_shared<JournalSource>("");
   // Not to wait here for a pipe's writer: that is for the reading, which can be stopped.
   posix::Descriptor opened(::open(log.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
-  struct stat about {};
+  struct stat about = {};
   if (!opened || ::fstat(opened.get(), &about) != 0) {
     throw std::runtime_error(log + ": " + std::generic_category().message(errno));
   }
