@@ -1,10 +1,23 @@
 # What is installed where, as Debian expects it, and how cpack makes a package of it.
 include(GNUInstallDirs)
+option(ZUB_PUBLISH "Package for others, which takes a contact: CPACK_PACKAGE_CONTACT" OFF)
+set(CPACK_PACKAGE_CONTACT "" CACHE STRING "Who answers for the package: NAME <ADDRESS>")
+set(contact "${CPACK_PACKAGE_CONTACT}")
+if(ZUB_PUBLISH AND NOT contact)
+  message(FATAL_ERROR "A package to publish needs -DCPACK_PACKAGE_CONTACT='NAME <ADDRESS>'")
+elseif(NOT contact)  # who builds it, as with Debian's tools
+  execute_process(COMMAND id -un OUTPUT_VARIABLE user OUTPUT_STRIP_TRAILING_WHITESPACE)
+  cmake_host_system_information(RESULT machine QUERY FQDN)
+  set(contact "${user} <${user}@${machine}>")
+endif()
 
 install(TARGETS zubtool)
 if(platform STREQUAL host)  # device profiles are that platform's
   install(DIRECTORY devices/ DESTINATION ${CMAKE_INSTALL_DATADIR}/zubtool/devices)
   set(host_pages zub-device.5)
+  set(of_another_platform "")
+else()
+  set(of_another_platform "/^[.].\" On the host {/,/^[.].\" }/d")
 endif()
 install(FILES completions/zubtool.bash RENAME zubtool
         DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions)
@@ -12,28 +25,50 @@ install(FILES completions/_zubtool DESTINATION ${CMAKE_INSTALL_DATADIR}/zsh/vend
 install(FILES completions/zubtool.fish
         DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d)
 
-# Man pages are compressed, the same bytes each time, where that is possible.
+# Man pages name the folder that they are installed to, and are compressed where that is possible.
 find_program(GZIP gzip)
+file(MAKE_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/docs)
 foreach(page zubtool.1 ${host_pages})
   string(REGEX MATCH "[0-9]$" section ${page})
-  set(installed ${CMAKE_CURRENT_SOURCE_DIR}/docs/${page})
-  if(GZIP)
-    set(source ${installed})
-    set(installed ${CMAKE_CURRENT_BINARY_DIR}/docs/${page}.gz)
-    add_custom_command(OUTPUT ${installed} DEPENDS ${source} VERBATIM
-                       COMMAND ${CMAKE_COMMAND} -E make_directory docs
-                       COMMAND sh -c [["$1" -9nc "$2" > "$3"]] sh ${GZIP} ${source} ${installed})
-    list(APPEND compressed_pages ${installed})
-  endif()
-  install(FILES ${installed} DESTINATION ${CMAKE_INSTALL_MANDIR}/man${section})
+  set(source ${CMAKE_CURRENT_SOURCE_DIR}/docs/${page})
+  set(made ${CMAKE_CURRENT_BINARY_DIR}/docs/${page})
+  set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${source})
+  execute_process(COMMAND sed -e "${of_another_platform}" ${source} OUTPUT_FILE ${made}
+                  COMMAND_ERROR_IS_FATAL ANY)
+  install(FILES ${made} DESTINATION ${CMAKE_INSTALL_MANDIR}/man${section})
+  list(APPEND compressed ${CMAKE_INSTALL_MANDIR}/man${section}/${page})
 endforeach()
-add_custom_target(man_pages ALL DEPENDS ${compressed_pages})
+
+# Debian's own documents: the changes in its form, and whose the tool is.
+set(changes ${CMAKE_CURRENT_BINARY_DIR}/docs/changelog)
+set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${CMAKE_CURRENT_SOURCE_DIR}/CHANGELOG.md)
+execute_process(COMMAND ${CMAKE_CURRENT_SOURCE_DIR}/packaging/debian-changelog "${contact}"
+                INPUT_FILE ${CMAKE_CURRENT_SOURCE_DIR}/CHANGELOG.md OUTPUT_FILE ${changes}
+                COMMAND_ERROR_IS_FATAL ANY)
+install(FILES ${changes} packaging/copyright DESTINATION ${CMAKE_INSTALL_DOCDIR})
+list(APPEND compressed ${CMAKE_INSTALL_DOCDIR}/changelog)
+
+string(CONFIGURE [[
+  foreach(name @compressed@)
+    set(file "$ENV{DESTDIR}${CMAKE_INSTALL_PREFIX}/${name}")
+    file(READ "${file}" text)
+    string(REPLACE /usr/share "${CMAKE_INSTALL_PREFIX}/@CMAKE_INSTALL_DATADIR@" text "${text}")
+    file(WRITE "${file}" "${text}")
+    if(EXISTS "@GZIP@")
+      execute_process(COMMAND "@GZIP@" -9nf "${file}" COMMAND_ERROR_IS_FATAL ANY)
+      list(TRANSFORM CMAKE_INSTALL_MANIFEST_FILES APPEND .gz REGEX "/${name}$")
+    endif()
+  endforeach()]] finish @ONLY)
+install(CODE "${finish}")
 
 set(CPACK_GENERATOR DEB)
-set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
+set(CPACK_SET_DESTDIR ON)
+set(CPACK_INSTALL_PREFIX /usr)
+set(CPACK_DEBIAN_PACKAGE_CONTROL_STRICT_PERMISSION ON)
+set(CPACK_PROJECT_CONFIG_FILE ${CMAKE_CURRENT_SOURCE_DIR}/packaging/cpack.cmake)
+set(CPACK_PRE_BUILD_SCRIPTS ${CMAKE_CURRENT_SOURCE_DIR}/packaging/folders.cmake)
 set(CPACK_STRIP_FILES ON)
-set(CPACK_PACKAGE_CONTACT "zubtool maintainers <zubtool@localhost>" CACHE STRING
-    "Who answers for the package")
+set(CPACK_DEBIAN_PACKAGE_MAINTAINER "${contact}")
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_SECTION utils)
 set(CPACK_DEBIAN_PACKAGE_PRIORITY optional)
@@ -46,8 +81,5 @@ processes into a text file.
 .
 On an ordinary Linux machine it runs on a device that a small text file
 describes.")
-find_program(DPKG_SHLIBDEPS dpkg-shlibdeps)
-if(DPKG_SHLIBDEPS)
-  set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
-endif()
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 include(CPack)

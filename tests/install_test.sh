@@ -19,7 +19,8 @@ fail() {
 expected() {
   local share=usr/share file
   printf '%s\n' '755 usr/bin/zubtool' "644 $share/man/man1/zubtool.1.gz" \
-    "644 $share/man/man5/zub-device.5.gz" "644 $share/bash-completion/completions/zubtool" \
+    "644 $share/man/man5/zub-device.5.gz" "644 $share/doc/zubtool/changelog.gz" \
+    "644 $share/doc/zubtool/copyright" "644 $share/bash-completion/completions/zubtool" \
     "644 $share/zsh/vendor-completions/_zubtool" \
     "644 $share/fish/vendor_completions.d/zubtool.fish"
   for file in "$sources"/devices/*; do echo "644 $share/zubtool/devices/${file##*/}"; done
@@ -69,12 +70,16 @@ sed "/manifest/I s|\"$build/|\"$scratch/instructions/|" "$build/cmake_install.cm
 DESTDIR=$scratch/installed cmake --install instructions --prefix /usr --strip >log 2>&1 ||
   fail "cmake --install: $(cat log)"
 check_files installed
+DESTDIR=$scratch/other cmake --install instructions --prefix /opt/z >log 2>&1
+zcat other/opt/z/share/man/man1/zubtool.1.gz | grep -q '^.It Pa /opt/z/share/zubtool/devices/' ||
+  fail "zubtool(1) does not name the folder that it was installed to"
 check_program "$scratch/installed"
 
 if ! command -v dpkg-deb >/dev/null || ! command -v dpkg-shlibdeps >/dev/null; then
   echo "not run: the package: dpkg-deb or dpkg-shlibdeps is not installed"
   exit 0
 fi
+umask 077  # of no matter to what is in a package
 cpack -G DEB --config "$build/CPackConfig.cmake" \
   -D "CPACK_INSTALL_CMAKE_PROJECTS=$scratch/instructions;zubtool;ALL;/" -B "$scratch/package" >log 2>&1 ||
   fail "cpack: $(cat log)"

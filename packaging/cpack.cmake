@@ -1,0 +1,12 @@
+# Read by cpack: without these programs it would make a package that depends on nothing.
+cmake_policy(VERSION 3.22)
+if(CPACK_GENERATOR STREQUAL DEB)
+  set(packages dpkg-dev file)
+  foreach(program dpkg-shlibdeps file)
+    list(POP_FRONT packages package)
+    find_program(found_${program} ${program})
+    if(NOT found_${program})
+      message(FATAL_ERROR "cpack -G DEB needs ${program}; please install the package ${package}")
+    endif()
+  endforeach()
+endif()
