@@ -1,7 +1,8 @@
 #include "tests/Table.h"
 
+#include <gtest/gtest.h>
+
 #include <sstream>
-#include <stdexcept>
 
 #include "tests/Program.h"
 
@@ -14,25 +15,32 @@ std::string unescaped(const std::string& text) {
       plain += static_cast<char>(std::stoi(text.substr(i + 1, 2), nullptr, 16));
       i += 2;
     } else {
-      plain += code == 'e' ? '\033' : code == 'n' ? '\n' : code == 't' ? '\t' : code;
+      constexpr std::string_view kCodes = "ents";
+      const auto found = kCodes.find(code);
+      plain += found == std::string_view::npos ? code : "\033\n\t "[found];
     }
   }
   return plain;
 }
 
-std::vector<std::vector<std::string>> readTable(const std::string& name, std::size_t columns) {
-  std::vector<std::vector<std::string>> rows;
-  std::istringstream stream(readFile(ZUBTOOL_SOURCES "/tests/tables/" + name + ".table"));
-  for (std::string line; std::getline(stream, line);) {
+void forEachRow(const std::string& name, std::size_t columns,
+                const std::function<void(const Row&)>& check) {
+  const std::string path = ZUBTOOL_SOURCES "/tests/tables/" + name + ".table";
+  std::istringstream stream(readFile(path));
+  std::string line;
+  int rows = 0;
+  for (int number = 1; std::getline(stream, line); ++number) {
     if (line.starts_with("# ")) continue;
-    auto& cells = rows.emplace_back();
+    const testing::ScopedTrace trace(path.c_str(), number, line);
+    Row row;
     for (std::size_t start = 0; start <= line.size();) {
       const auto end = std::min(line.find(" | ", start), line.size());
-      cells.push_back(unescaped(line.substr(start, end - start)));
+      row.push_back(unescaped(line.substr(start, end - start)));
       start = end == line.size() ? end + 1 : end + 3;
     }
-    if (cells.size() != columns) throw std::runtime_error(name + ": " + line);
+    EXPECT_EQ(row.size(), columns) << "cells";
+    if (row.size() == columns) check(row);
+    ++rows;
   }
-  if (rows.empty()) throw std::runtime_error("no rows: " + name);
-  return rows;
+  EXPECT_GT(rows, 0) << path;
 }

@@ -129,12 +129,12 @@ Words commandLine(const std::string& line) {
 TEST(Shell, RunsCommandLinesAndTypedLines) {
   for (const std::string table : {"shell-words", "shell-lines"}) {
     const bool isTyped = table == "shell-lines";
-    for (const auto& row : readTable(table, 3)) {
+    forEachRow(table, 3, [isTyped](const Row& row) {
       const CapturedOutput out;
       const TypedInput in(isTyped ? row[0] : "");
-      EXPECT_EQ(TestShell().run(commandLine(isTyped ? "" : row[0])), row[2] == "true") << row[0];
-      EXPECT_EQ(out.str(), row[1]) << row[0];
-    }
+      EXPECT_EQ(TestShell().run(commandLine(isTyped ? "" : row[0])), row[2] == "true");
+      EXPECT_EQ(out.str(), row[1]);
+    });
   }
 }
 
@@ -175,7 +175,7 @@ TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
       true);
   const CapturedOutput out(true);
   root->displayHelp();
-  EXPECT_EQ(out.str(), readTable("help", 1)[0][0]);
+  forEachRow("help", 1, [&out](const Row& row) { EXPECT_EQ(out.str(), row[0]); });
 }
 
 TEST(Command, RegistersAndLooksUp) {

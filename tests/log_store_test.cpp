@@ -89,12 +89,12 @@ std::string summary(const OSLogEventProxy& event) {
 }
 
 TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
-  for (const auto& row : readTable("event-fields", 2)) {
+  forEachRow("event-fields", 2, [](const Row& row) {
     const std::string log = kDate + row[0] + '\n';
     RecordedLogReader reader(std::make_unique<Pieces>(log, 1));
     ASSERT_EQ(reader.next(), EntryReader::Result::entry);
-    EXPECT_EQ(summary(host::LogEvent(reader.entry())), row[1]) << row[0];
-  }
+    EXPECT_EQ(summary(host::LogEvent(reader.entry())), row[1]);
+  });
 }
 
 TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
@@ -106,7 +106,7 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
                                              {'S', binary("MESSAGE", "xyz", 2)},
                                              {'C', binary("MESSAGE", "", host::kMaxField + 1)},
                                              {'L', binary("X", "", ~0ULL)}};
-  for (const auto& row : readTable("damage", 2)) {
+  forEachRow("damage", 2, [&parts](const Row& row) {
     std::string log;
     for (std::size_t i = 0; i < row[0].size(); ++i) {
       log += row[0][i] == '%' ? parts.at(row[0][++i]) : row[0].substr(i, 1);
@@ -115,9 +115,9 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
       std::string seen;
       for (const auto& text : readAll(log, piece))
         seen += (text == kForged ? "FORGED" : text) + "; ";
-      EXPECT_EQ(seen, row[1] + "; ") << row[0];
+      EXPECT_EQ(seen, row[1] + "; ");
     }
-  }
+  });
 }
 
 TEST(RecordedLog, CutOffAnywhereLosesTheLastEntryAlone) {
@@ -156,17 +156,17 @@ TEST(RecordedLog, LongFieldsAreWholeUpToTheCap) {
 }
 
 TEST(Text, Utf8IsRepairedByMaximalSubparts) {
-  for (const auto& row : readTable("utf8", 2)) {
+  forEachRow("utf8", 2, [](const Row& row) {
     std::string storage;
     EXPECT_EQ(posix::asUtf8(row[0], storage), row[1]);
-    EXPECT_EQ(posix::isUtf8(row[0]), row[0] == row[1]) << row[1];
-  }
+    EXPECT_EQ(posix::isUtf8(row[0]), row[0] == row[1]);
+  });
 }
 
 TEST(Text, FoldingIgnoresCaseAndDiacritics) {
-  for (const auto& row : readTable("folding", 3)) {
-    EXPECT_EQ(host::FoldedText(row[0]).isIn(row[1]), row[2] == "true") << row[0];
-  }
+  forEachRow("folding", 3, [](const Row& row) {
+    EXPECT_EQ(host::FoldedText(row[0]).isIn(row[1]), row[2] == "true");
+  });
 }
 
 /// What a stream has delivered: the summaries, and the reason of its end.
@@ -371,7 +371,7 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
   const std::string id = folder + "/0123456789ABCDEF0123456789abcdef";
   std::filesystem::create_directory(id);
   const std::string file = makeFile("x", logOf(140));
-  for (const auto& row : readTable("journal-filters", 3)) {
+  forEachRow("journal-filters", 3, [&](const Row& row) {
     const auto deliver = [&row](const std::string& log) {
       const auto from = stream(log);
       OSLogOrPredicate filter;
@@ -380,14 +380,14 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
       return run(from, 0, OSLogDate(1'700'000'000'000'070));
     };
     const Delivered recorded = deliver(folder + "/log");
-    EXPECT_EQ(recorded.events.size(), std::stoul(row[2])) << row[1];
-    EXPECT_TRUE(recorded.events == deliver(file).events) << row[1];
+    EXPECT_EQ(recorded.events.size(), std::stoul(row[2]));
+    EXPECT_TRUE(recorded.events == deliver(file).events);
     std::filesystem::rename(file, id + "/x.journal");
     const Delivered journal = deliver(folder);
     std::filesystem::rename(id + "/x.journal", file);
-    EXPECT_TRUE(recorded.events == journal.events) << row[1];
-    EXPECT_EQ(journal.reason, kOSLogEventStreamEndOfLog) << row[1];
-  }
+    EXPECT_TRUE(recorded.events == journal.events);
+    EXPECT_EQ(journal.reason, kOSLogEventStreamEndOfLog);
+  });
   EXPECT_EQ(run(stream(file), 3).reason, host::kStreamInvalidated);
 }
 

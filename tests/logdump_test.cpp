@@ -14,27 +14,27 @@
 namespace {
 
 TEST(TraceProperty, ReadsWordsAndNumbers) {
-  for (const auto& row : readTable("trace-property", 3)) {
+  forEachRow("trace-property", 3, [](const Row& row) {
     const auto mode = ParseTraceMode(row[0]);
-    EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]) << '"' << row[0] << '"';
+    EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]);
     for (const bool before : {false, true}) {
       bool after = before;
       parseBoolProperty(row[0], after);
-      EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true") << '"' << row[0] << '"';
+      EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true");
     }
-  }
+  });
 }
 
 TEST(LogdumpOptions, TakeWordsInAnyOrderUpToTheReason) {
-  for (const auto& row : readTable("options", 4)) {
+  forEachRow("options", 4, [](const Row& row) {
     auto mode = CompressionMode::tar;
     std::string reason = "before";
     bool noUi = false;
     parseLogdumpOptions(convertLineToList(row[0]), mode, reason, noUi);
-    EXPECT_EQ(std::to_string(static_cast<int>(mode)), row[1]) << row[0];
-    EXPECT_EQ(reason, row[2]) << row[0];
-    EXPECT_EQ(noUi, row[3] == "true") << row[0];
-  }
+    EXPECT_EQ(std::to_string(static_cast<int>(mode)), row[1]);
+    EXPECT_EQ(reason, row[2]);
+    EXPECT_EQ(noUi, row[3] == "true");
+  });
 }
 
 TEST(TraceNames, FollowTheVendorAndTheCoreDumpSuffixOnlyOnce) {

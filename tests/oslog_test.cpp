@@ -182,21 +182,21 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
 
 TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
   const std::string history = "error: Getting oslog stream: history = ";
-  for (const auto& row : readTable("oslog-command", 3)) {
+  forEachRow("oslog-command", 3, [&](const Row& row) {
     calls.clear();
     auto words = convertLineToList(row[0]);
     std::ranges::replace(words, "OUT", output);
     const auto group = dispatch::group::create();
-    EXPECT_TRUE(OsLogHandler()(group, words)) << row[0];
+    EXPECT_TRUE(OsLogHandler()(group, words));
     EXPECT_TRUE(group.wait(0ns));
     std::string asked;
     for (const auto& call : calls) {
       if (call.find("%@") != std::string::npos) asked += call + "; ";
       if (call.starts_with(history)) asked += call.substr(history.size());
     }
-    EXPECT_EQ(asked, row[1] + row[2]) << row[0];
+    EXPECT_EQ(asked, row[1] + row[2]);
     thread.join();
-  }
+  });
 }
 
 TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {

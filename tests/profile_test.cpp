@@ -44,10 +44,10 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
 }
 
 TEST(Profile, RefusesWhatItDoesNotUnderstand) {
-  for (const auto& row : readTable("profile-errors", 2)) {
+  forEachRow("profile-errors", 2, [](const Row& row) {
     Profile profile;
     EXPECT_EQ(parse(row[0], profile).value_or("good"), "dir/p.device:" + row[1]);
-  }
+  });
 }
 
 TEST(Profile, ThoseThatShipAreGood) {

@@ -12,11 +12,11 @@ namespace {
 
 TEST(Dates, HaveTheirDefaultForm) {
   using Limits = std::numeric_limits<std::int64_t>;
-  for (const auto& row : readTable("dates", 2)) {
+  forEachRow("dates", 2, [](const Row& row) {
     std::string text;
     OSLogDate(std::stoll(row[0])).appendDescription(text);
     EXPECT_EQ(text, row[1]);
-  }
+  });
   const OSLogDate date(5);
   EXPECT_EQ(date.addingSeconds(-0.29), OSLogDate(5 - 290'000));
   EXPECT_EQ(date.addingSeconds(std::nan("")), date);
