@@ -1,6 +1,7 @@
 #include "tests/Program.h"
 
 #include <fcntl.h>
+#include <gtest/gtest.h>
 #include <pty.h>
 #include <sys/wait.h>
 #include <termios.h>
@@ -9,7 +10,6 @@
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
-#include <ostream>
 
 ScratchFolder::ScratchFolder() {
   std::string name = std::filesystem::temp_directory_path() / "zubtool-test-XXXXXX";
@@ -28,11 +28,11 @@ void writeFile(const std::string& path, const std::string& text) {
   std::ofstream(path, std::ios::binary) << text;
 }
 
-std::ostream& operator<<(std::ostream& stream, const Outcome& outcome) {
-  return stream << "status " << outcome.status << "\n--- out\n"
-                << outcome.out << "--- err\n"
-                << outcome.err << "--- requests\n"
-                << outcome.requests;
+void expectOutcome(const Outcome& actual, const Outcome& expected) {
+  EXPECT_EQ(actual.out, expected.out);
+  EXPECT_EQ(actual.err, expected.err);
+  EXPECT_EQ(actual.requests, expected.requests);
+  EXPECT_EQ(actual.status, expected.status);
 }
 
 Program::Program(const Start& start) {

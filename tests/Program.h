@@ -3,7 +3,6 @@
 #include <sys/types.h>
 
 #include <filesystem>
-#include <iosfwd>
 #include <memory>
 #include <optional>
 #include <string>
@@ -42,11 +41,10 @@ struct Outcome {
   std::string err = {};
   int status = 0;  ///< exit status, or 1000 and the signal that ended it
   std::string requests = {};
-
-  friend bool operator==(const Outcome&, const Outcome&) = default;
 };
 
-std::ostream& operator<<(std::ostream& stream, const Outcome& outcome);
+/// Compares each part by itself, so that the lines which differ are shown.
+void expectOutcome(const Outcome& actual, const Outcome& expected);
 
 /// A started program. Its standard streams are pipes, or a terminal.
 class Program {
