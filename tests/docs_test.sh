@@ -1,13 +1,11 @@
 #!/usr/bin/env bash
-# Compares completions, man pages and the example profile with what the program itself takes.
+# Compares completions and the manual page with the words that the program itself takes.
 # usage: tests/docs_test.sh PROGRAM   (the path of zubtool)
 set -euo pipefail
 export LC_ALL=C
 
 program=$1
 sources=$(cd "$(dirname "$0")/.." && pwd)
-scratch=$(mktemp -d)
-trap 'rm -rf "$scratch"' EXIT
 failed=0
 
 wrong() {
@@ -94,34 +92,6 @@ check_words() {
     "$(printf '%s\n' "${tree[@]}")" "$named"$'\n'"$letters"
 }
 
-# Prints those of the texts in the parser's source that it takes for a key.
-keys_of_profile() {
-  local profile=$scratch/device text message status
-  find_all '"[^"]*"' <"$sources/platform/host/device/Profile.cpp" | sed 's/^"//; s/"$//; /^$/d' |
-    sort -u >"$scratch/texts"
-  while IFS= read -r text; do
-    printf '%s =\n=\n' "$text" >"$profile"  # the second line is wrong whatever the first is
-    status=0
-    message=$(ZUB_DEVICE=$profile "$program" help 2>&1 >/dev/null </dev/null) || status=$?
-    [[ $status == 255 && $message == "$profile:"[12]:* ]] ||
-      fail "with '$text' for a key: status $status, and: $message"
-    [[ $message == "$profile:1: unknown key "* ]] || printf '%s\n' "$text"
-  done <"$scratch/texts"
-}
-
-check_keys() {
-  local page=$sources/docs/zub-device.5 phone=$sources/devices/phone.device keys defaults
-  keys=$(keys_of_profile) || exit 1
-  check_same 'zub-device(5) should name other keys (<) than it does (>)' \
-    "$keys" "$(find_all '^\.It Ic \K\S+' <"$page")"
-  # There is no request-log by default, and no way to say so.
-  check_same 'phone.device should set other keys (<) than it does (>)' \
-    "$(sed '/^request-log$/d' <<<"$keys")" "$(find_all '^\S+(?= =)' <"$phone")"
-  defaults=$(sed 's/ No = / = /' "$page" | find_all '^\.It Ic \K\S+ = .*')
-  check_same 'zub-device(5) has other defaults (<) than phone.device (>)' \
-    "$defaults" "$(find_all '^\S+ = .*?(?= *(#.*)?$)' <"$phone")"
-}
-
 read_tree
 for shell in bash zsh fish; do
   if command -v "$shell" >/dev/null; then
@@ -131,5 +101,4 @@ for shell in bash zsh fish; do
   fi
 done
 check_words
-check_keys
 exit "$failed"

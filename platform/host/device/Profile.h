@@ -17,12 +17,16 @@ struct Answer {
   Kind kind = Kind::value;
   std::string text = {};  ///< of a value, where the request has one
   std::int32_t code = 0;  ///< of an error
+
+  friend bool operator==(const Answer&, const Answer&) = default;
 };
 
 /// The server reports `state` at `at` after the manager is made.
 struct ServerStep {
   std::chrono::milliseconds at;
   std::string state;
+
+  friend bool operator==(const ServerStep&, const ServerStep&) = default;
 };
 
 enum class Build { internal, carrier, customer };
@@ -57,7 +61,12 @@ struct Profile {
   std::string logPrepareError;  ///< empty when the store can be prepared
   bool hasLogPath() const { return log != "sample" && log != "journal"; }
   std::optional<unsigned long> logEnd = 5;  ///< the reason a stream ends with; none: it never ends
+
+  friend bool operator==(const Profile&, const Profile&) = default;
 };
+
+/// The keys that a profile may set.
+std::vector<std::string_view> profileKeys();
 
 /// Reads the text of a profile into `profile`, which keeps its defaults for keys that are not set.
 /// `file` is the profile's path, for messages and for the paths it takes from its own folder.
