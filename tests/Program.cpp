@@ -3,10 +3,12 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
 #include <pty.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <termios.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <cstdlib>
 #include <fstream>
 #include <iterator>
@@ -63,6 +65,7 @@ Program::Program(const Start& start) {
 }
 
 void Program::execute(const Start& start, int input, int output) const {
+  prctl(PR_SET_PDEATHSIG, SIGKILL);  // a test that is given up takes its program along
   if (!start.onTerminal) {
     dup2(input, STDIN_FILENO);
     if (!start.input) close(STDIN_FILENO);
