@@ -51,6 +51,13 @@ TEST(TraceNames, FollowTheVendorAndTheCoreDumpSuffixOnlyOnce) {
   EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-qdss");
 }
 
+TEST(Telephony, ProcessesOfThisMachineRunIfTheDeviceSaysSo) {
+  EXPECT_FALSE(tlu::isProcessRunning("zub_tests"));
+  host::device().hostProcesses = true;
+  EXPECT_TRUE(tlu::isProcessRunning("zub_tests"));
+  EXPECT_FALSE(tlu::isProcessRunning("zub_test"));
+}
+
 TEST(ServerState, RunsOnlyInTheStartedState) {
   const auto stateIs = [](lumo::object state) {
     lumo::dict payload;

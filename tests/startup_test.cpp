@@ -30,6 +30,10 @@ TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
     EXPECT_EQ(WhyNotToStart() == nullptr, one.starts) << one.asked;
     EXPECT_EQ(device.asked, one.asked);
   }
+  for (int product = 0; product < 60; ++product) {
+    device = {1, product, "", ""};
+    EXPECT_EQ(WhyNotToStart() == nullptr, product >= 32 && product < 46) << product;
+  }
 }
 
 }  // namespace
