@@ -1,5 +1,7 @@
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <malloc.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -177,7 +179,11 @@ struct Delivered {
 
 class LogStore : public testing::Test {
  protected:
-  ~LogStore() override { host::device() = device; }
+  ~LogStore() override {
+    prepared.reset();
+    EXPECT_EQ(openDescriptors(), descriptors) << "what has been opened is closed";
+    host::device() = device;
+  }
 
   std::string write(const std::string& name, const std::string& text, mode_t mode = 0644) {
     std::string file = scratch.path(name);
@@ -195,14 +201,17 @@ class LogStore : public testing::Test {
     return error.value_or("none");
   }
 
-  static std::shared_ptr<OSLogEventStream> stream(const std::string& log) {
-    std::shared_ptr<OSLogEventStream> made;
+  static std::ptrdiff_t openDescriptors() {
+    return std::ranges::distance(std::filesystem::directory_iterator("/proc/self/fd"));
+  }
+
+  std::shared_ptr<OSLogEventStream> stream(const std::string& log) {
     host::device().log = log;
     OSLogEventStore::localStore()->prepareWithCompletionHandler([&](auto source, const auto& why) {
       EXPECT_EQ(why.value_or("none"), "none");
-      made = OSLogEventStream::initWithSource(source);
+      prepared = source;
     });
-    return made;
+    return OSLogEventStream::initWithSource(prepared);
   }
 
   /// Runs a stream to its end; `onEvent` is called with the number of each event.
@@ -235,21 +244,27 @@ class LogStore : public testing::Test {
 
   const ScratchFolder scratch;
   const std::string folder = std::filesystem::path(scratch.path("file")).parent_path();
+  const std::ptrdiff_t descriptors = openDescriptors();
+  std::shared_ptr<OSLogEventSource> prepared;  ///< by the last call of stream()
   const host::Profile device = host::device();
 };
 
 TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   const std::string log =
       write("log",
-            "__REALTIME_TIMESTAMP=3000000\n_COMM=a\nMESSAGE=3\n\n__REALTIME_TIMESTAMP=1999999\n"
-            "_COMM=a\n\n__REALTIME_TIMESTAMP=2000000\n_COMM=b\n_EXE=/A/É\nMESSAGE=2\n\n"
+            "__REALTIME_TIMESTAMP=3000000\n_COMM=a\nMESSAGE=3\n\n__REALTIME_TIMESTAMP=2000000\n"
+            "_COMM=a\n\n__REALTIME_TIMESTAMP=2000001\n_COMM=b\n_EXE=/A/É\nMESSAGE=2\n\n"
             "__REALTIME_TIMESTAMP=4000000\n_COMM=ab\n\n");
   auto wanted = stream(log);
   wanted->setFilterPredicate(
       {{{"process == %@", "a"}, {"senderImagePath CONTAINS[cd] %@", "a/e"}}});
-  Delivered delivered = run(wanted, 0, OSLogDate(2'000'000));
+  Delivered delivered = run(wanted, 0, OSLogDate(2'000'001));
   EXPECT_EQ(delivered.events, (Texts{"1024 0 0 0|a|a|||3@0", "1024 0 0 0|b|É|||2@0"}));
   EXPECT_EQ(delivered.reason, kOSLogEventStreamEndOfLog);
+  EXPECT_EQ(run(OSLogEventStream::initWithSource(prepared)).events.size(), 4) << "once more";
+  wanted = stream(log);
+  wanted->setFilterPredicate({});
+  EXPECT_EQ(run(wanted).events.size(), 0) << "no term is true";
   EXPECT_THROW(stream(log)->setFilterPredicate({{{"pid == %@", "1"}}}), std::invalid_argument);
 
   host::device().logEnd = 9;
@@ -265,13 +280,50 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   EXPECT_EQ(run(stopped).events.size(), 0);
 }
 
-TEST_F(LogStore, InvalidateInterruptsAReadThatIsBlocked) {
+TEST_F(LogStore, ReadsOnWhileAnEventIsHandledUntilItIsInvalidated) {
   const std::string pipe = folder + "/pipe";
   ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
   const auto blocked = stream(pipe);  // does not wait for a writer
   std::ofstream writer(pipe);
   writer << kDate << "\n" << std::flush;
-  EXPECT_EQ(run(blocked, 1).reason, host::kStreamInvalidated);
+  const int reader = open(pipe.c_str(), O_RDONLY | O_NONBLOCK);
+  int unread = 1;
+  const auto logMoreAndStop = [&](std::size_t) {
+    writer << kDate << "\n" << std::flush;
+    const auto end = std::chrono::steady_clock::now() + 10s;
+    while (unread > 0 && std::chrono::steady_clock::now() < end) ioctl(reader, FIONREAD, &unread);
+    blocked->invalidate();
+  };
+  EXPECT_EQ(run(blocked, OSLogDate(0), logMoreAndStop).reason, host::kStreamInvalidated);
+  EXPECT_EQ(unread, 0);
+  close(reader);
+}
+
+TEST_F(LogStore, HoldsTextsOfAnySizeAsLongAsTheyAreInHand) {
+  constexpr std::size_t kHuge = 20'000'000;
+  const auto textOf = [](std::size_t i) {
+    return std::string(i == 8 ? kHuge : 100'000, "abcde"[i % 5]);
+  };
+  std::string text;
+  for (std::size_t i = 0; i < 40; ++i) text += kDate + "MESSAGE=" + textOf(i) + "\n\n";
+  const std::string log = write("log", std::exchange(text, {}));
+  const auto inUse = [] { return mallinfo2().uordblks + mallinfo2().hblkhd; };
+  const auto sized = stream(log);
+  std::size_t seen = 0;
+  std::size_t held = 0;
+  const auto ended = dispatch::group::create();
+  const auto before = inUse();
+  sized->setEventHandler([&](const OSLogEventProxy& event) {
+    EXPECT_TRUE(event.composedMessage() == textOf(seen)) << seen;
+    if (++seen == 40) held = inUse() - before;
+  });
+  sized->setInvalidationHandler([member = dispatch::membership(ended)](auto, const auto&) {});
+  sized->activateStreamFromDate(OSLogDate(0));
+  sized->setInvalidationHandler(nullptr);
+  EXPECT_TRUE(ended.wait(60s));
+  EXPECT_EQ(seen, 40U);
+  EXPECT_LT(held, kHuge / 2);
+  EXPECT_EQ(run(stream(log), 1).reason, host::kStreamInvalidated) << "while it reads ahead";
 }
 
 TEST_F(LogStore, TooLittleMemoryEndsTheStreamAndNotTheProcess) {
@@ -372,7 +424,7 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
   std::filesystem::create_directory(id);
   const std::string file = makeFile("x", logOf(140));
   forEachRow("journal-filters", 3, [&](const Row& row) {
-    const auto deliver = [&row](const std::string& log) {
+    const auto deliver = [&](const std::string& log) {
       const auto from = stream(log);
       OSLogOrPredicate filter;
       if (!row[0].empty()) filter.terms.push_back({row[0], row[1]});

@@ -140,7 +140,7 @@ class JournalReader final : public EntryReader {
 
   /// False when the entry has no date that an event can have.
   bool readEntry() {
-    if (size > kFirstPart) copies = {};  // what huge fields have left is not held
+    if (size > kFirstPart) decltype(copies)().swap(copies);  // what huge fields have left
     current = LogEntry();
     size = 0;
     std::uint64_t date = 0;

@@ -47,8 +47,8 @@ EntryReader::Result RecordedLogReader::next() {
 void RecordedLogReader::startEntry() {
   current = LogEntry();
   begun = complete = false;
-  // What a huge field has left behind is not held for good.
-  if (kept > kBuffer) copies = {};
+  // What a huge field has left is not held on to, as a text that is assigned an empty one would.
+  if (kept > kBuffer) decltype(copies)().swap(copies);
   kept = 0;
 }
 
