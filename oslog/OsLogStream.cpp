@@ -10,7 +10,6 @@
 
 namespace {
 
-constexpr std::chrono::seconds kTimeout{180};
 constexpr std::uint64_t kStreamFlags = 21;  // the bits are the log store's
 
 using StreamHandle = std::shared_ptr<OSLogEventStream>;

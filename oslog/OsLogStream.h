@@ -30,6 +30,7 @@ class OsLogStream {
  private:
   friend struct OsLogStreamClock;  // lets a test wait for less than 180 seconds
 
+  static constexpr std::chrono::seconds kTimeout{180};
   static bool putWithin(std::chrono::nanoseconds timeout, const std::string& path,
                         const std::list<std::string>& process,
                         const std::list<std::string>& imagePath, double history);

@@ -22,6 +22,7 @@
 #include "tests/Table.h"
 
 struct OsLogStreamClock {
+  static_assert(OsLogStream::kTimeout == std::chrono::minutes(3), "as the manual page says");
   static bool put(std::chrono::nanoseconds timeout, const std::string& path) {
     return OsLogStream::putWithin(timeout, path, {}, {}, 0);
   }

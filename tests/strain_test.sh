@@ -63,29 +63,9 @@ soak() {
   [ ! -s err ] || fail "the long run complains: $(head -n 3 err)"
 }
 
-# The server comes and goes: each command is either done or refused, and neither is lost or doubled.
-soak_with_a_server_that_comes_and_goes() {
-  local rounds=2500 refused failed done_ helped
-  {
-    printf 'dump-timestamp = T\nserver = 0 Started'
-    for ((ms = 500; ms < 10000; ms += 10)); do printf ', %d Off, %d Started' $ms $((ms + 5)); done
-    printf '\n'
-  } >device
-  { commands $rounds; echo quit; } | ZUB_DEVICE=device "$program" >out 2>err || fail "status $?"
-  refused=$(grep -c '^Server is not running. Please try after server starts.$' err || true)
-  failed=$(grep -cE 'Telephony log collection.*: Failed$' out || true)  # gone behind the gate
-  done_=$(grep -cE 'Telephony log collection.*: Success$' out || true)
-  helped=$(grep -cE 'Success \(ZUB (not )?running\)$' out)
-  [ "$(wc -l <err)" = "$refused" ] || fail "other complaints: $(grep -v '^Server' err | head -n 3)"
-  [ $((refused + failed + done_)) = $((2 * rounds)) ] ||
-    fail "$refused refused, $failed failed, $done_ done"
-  [ "$helped" = "$rounds" ] || fail "$helped baseband collections"
-  [ "$(grep -c 'Path = ' out)" = $((done_ + helped)) ] || fail "a path is lost or doubled"
-}
-
 soak
-soak_with_a_server_that_comes_and_goes
 
+expect_status 255 "no such profile" env ZUB_DEVICE=none "$program" help
 expect_status 0 "closed standard output" sh -c '"$0" help >&-' "$program"
 expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$program"
 expect_status 0 "full standard output and error" sh -c '"$0" help >/dev/full 2>&1' "$program"
