@@ -72,7 +72,6 @@ void Program::execute(const Start& start, int input, int output) const {
     dup2(output, STDOUT_FILENO);
     dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }
-  if (int ends[2]; start.readerGone && pipe2(ends, O_CLOEXEC) == 0) dup2(ends[1], STDOUT_FILENO);
   setenv("TZ", "UTC", 1);
   setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
   std::vector<std::string> command = {ZUBTOOL_EMULATOR};

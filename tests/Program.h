@@ -32,7 +32,6 @@ struct Start {
   std::optional<std::string> input = std::string();  ///< standard input; none: it is closed
   std::string name = "zubtool";                      ///< under which the program is invoked
   bool onTerminal = false;  ///< a pseudo-terminal stands for all three standard streams
-  bool readerGone = false;  ///< standard output is a pipe that nobody reads any more
 };
 
 /// What one run of the program left behind.

@@ -123,12 +123,6 @@ TEST(Shell, RunsCommandLinesAndTypedLines) {
   }
 }
 
-TEST(Shell, TakesArgumentsAsTheyAre) {
-  const char* const arguments[] = {"/bin/r", "", "a  b", "--"};
-  EXPECT_EQ(CommandShell::convertCmdArgsToList(4, arguments), (Words{"--", "a  b", "", "/bin/r"}));
-  EXPECT_EQ(CommandShell::convertCmdArgsToList(0, arguments), Words());
-}
-
 TEST(Shell, NeedsATreeButNoProgramName) {
   const CapturedOutput out;
   const TypedInput in("quit\n");

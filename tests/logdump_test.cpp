@@ -3,15 +3,12 @@
 #include <algorithm>
 #include <ctime>
 
-#include "framework/WordList.h"
-#include "logdump/LogdumpOptions.h"
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
 #include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
 #include "tests/CapturedOutput.h"
 #include "tests/Table.h"
-#include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"
 
 namespace {
@@ -25,18 +22,6 @@ TEST(TraceProperty, ReadsWordsAndNumbers) {
       parseBoolProperty(row[0], after);
       EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true");
     }
-  });
-}
-
-TEST(LogdumpOptions, TakeWordsInAnyOrderUpToTheReason) {
-  forEachRow("options", 4, [](const Row& row) {
-    auto mode = CompressionMode::tar;
-    std::string reason = "before";
-    bool noUi = false;
-    parseLogdumpOptions(convertLineToList(row[0]), mode, reason, noUi);
-    EXPECT_EQ(std::to_string(static_cast<int>(mode)), row[1]);
-    EXPECT_EQ(reason, row[2]);
-    EXPECT_EQ(noUi, row[3] == "true");
   });
 }
 
@@ -66,23 +51,6 @@ TEST(Answers, HaveTheTimeOfDay) {
   EXPECT_EQ(text.size(), 23U);
   const auto at = std::mktime(&local);
   EXPECT_TRUE(before <= at && at <= std::time(nullptr)) << text;
-}
-
-TEST(ServerState, RunsOnlyInTheStartedState) {
-  const auto stateIs = [](lumo::object state) {
-    lumo::dict payload;
-    payload.set("Other", "Started");
-    payload.set(zub::kKeyServerState, std::move(state));
-    return payload;
-  };
-  const lumo::object others[] = {{}, "Started", stateIs(true), stateIs("started"), stateIs({})};
-  EXPECT_FALSE(IsServerRunning());
-  for (const auto& other : others) {
-    SetServerState(stateIs("Started"));
-    EXPECT_TRUE(IsServerRunning());
-    SetServerState(other);
-    EXPECT_FALSE(IsServerRunning());
-  }
 }
 
 TEST(ZUBCommand, SharesItsConnectionFlushesEachLineAndGivesAllBack) {

@@ -59,6 +59,8 @@ soak
 
 expect_status 255 "no such profile" env ZUB_DEVICE=none "$program" help
 expect_status 0 "closed standard output" sh -c '"$0" help >&-' "$program"
+expect_status 0 "standard output without a reader" \
+  bash -c 'set -o pipefail; "$0" logdump tel | true' "$program"
 expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$program"
 expect_status 0 "full standard output and error" sh -c '"$0" help >/dev/full 2>&1' "$program"
 expect_status 1 "a line of 100 MB" sh -c 'head -c 100000000 /dev/zero | tr "\0" a | "$0"' "$program"
