@@ -4,7 +4,6 @@
 #include <functional>
 #include <iostream>
 #include <sstream>
-#include <thread>
 
 #include "framework/CommandShell.h"
 #include "framework/WordList.h"
@@ -179,26 +178,6 @@ TEST(Command, LooksUpWhatHasBeenRegistered) {
   const std::weak_ptr<CommandBase> gone = Node::create("gone", {}, [](Node&) {});
   const auto orphan = Node::create("o", gone, [](Node&) {});
   EXPECT_EQ(orphan->getHierarchy(), "/o");
-}
-
-TEST(Command, ReturnsWhenTheWorkOfItsHandlerHasEnded) {
-  std::thread worker;
-  std::atomic<bool> ended = false;
-  const auto node = Node::create("r", {}, [&](Node& self) {
-    self.addCommandHandler(
-        "work",
-        [&](const dispatch::group& group, const Words&) {
-          worker = std::thread([&ended, member = dispatch::membership(group)] {
-            std::this_thread::sleep_for(std::chrono::milliseconds(50));
-            ended = true;
-          });
-          return false;
-        },
-        "");
-  });
-  EXPECT_FALSE(node->execCommand("work", {}));
-  EXPECT_TRUE(ended);
-  worker.join();
 }
 
 }  // namespace
