@@ -57,10 +57,9 @@ class CaseFile {
 
  private:
   void readLine(const std::string& line) {
-    const auto blank = std::min(line.find(' '), line.size() - 1);
-    auto key = line.substr(0, blank + 1);
-    if (key.ends_with(' ')) key.pop_back();
-    const auto text = unescaped(line.substr(blank + 1));
+    const auto blank = std::min(line.find(' '), line.size());
+    const auto key = line.substr(0, blank);
+    const auto text = unescaped(line.substr(std::min(blank + 1, line.size())));
     if (line.ends_with(' ')) throw std::runtime_error("a blank at the end is to be written \\s");
     if (key == "==") return startCase(text);
     if (cases.empty()) throw std::runtime_error("no case has been started");
