@@ -10,7 +10,7 @@ namespace {
 
 /// Reads a line of standard input. False at its end. Throws `std::bad_alloc`, with the line passed
 /// over, when it does not fit into memory.
-bool ReadLine(std::string& line) {
+bool ReadTypedLine(std::string& line) {
   if (std::getline(std::cin, line)) return true;
   if (!std::cin.bad()) return false;
   std::cin.clear();  // not the stream has failed, but the string
@@ -44,7 +44,7 @@ CommandShell::Outcome CommandShell::runLines() {
     std::cout << '(' << currentCommand->getHierarchy() << ")>> " << std::flush;
     try {
       std::string line;
-      if (!ReadLine(line)) return Outcome::failed;
+      if (!ReadTypedLine(line)) return Outcome::failed;
       if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
     } catch (const std::bad_alloc&) {
       std::cerr << "Not enough memory for this line" << std::endl;

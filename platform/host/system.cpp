@@ -3,6 +3,7 @@
 #include <syslog.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 
 const char* getprogname() { return program_invocation_short_name; }
@@ -11,4 +12,8 @@ void platform::runMainEventLoop() {
   for (;;) pause();  // the callbacks of this platform run on threads of their own
 }
 
-void platform::logError(const std::string& message) { syslog(LOG_ERR, "%s", message.c_str()); }
+void platform::logError(const std::string& message) {
+  std::string text = message;
+  std::ranges::replace(text, '\0', '?');  // which would end it for syslog
+  syslog(LOG_ERR, "%s", text.c_str());
+}
