@@ -21,10 +21,9 @@ TEST(StandardStreams, GoOnAfterAFailureAndWriteEachLineAtOnce) {
     dup2(ends[1], number);
     *stream << "line " << 1 << std::endl;
     dup2(before, number);
-    char text[64];
-    const auto length = read(ends[0], text, sizeof text);
-    EXPECT_EQ(std::string(text, static_cast<std::size_t>(std::max<ssize_t>(length, 0))),
-              "line 1\n");
+    char text[64] = {};
+    EXPECT_GT(read(ends[0], text, sizeof text - 1), 0);
+    EXPECT_STREQ(text, "line 1\n");
   }
 }
 
