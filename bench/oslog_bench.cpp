@@ -1,4 +1,5 @@
-// The export of a recorded log, against reading it once and appending each line with one write.
+// The export of a recorded log, against reading it once and appending each line with one write; and
+// of one that is badly encoded, against one that is not.
 
 #include <benchmark/benchmark.h>
 #include <fcntl.h>
@@ -91,6 +92,27 @@ void BM_Export(benchmark::State& state) {
                  [&] { readAndAppend(folder.file("log"), folder.file("floor"), lines); });
 }
 
+/// One message of some MiB, of which some bytes are Latin-1, against the same size in ASCII.
+void BM_ExportBadlyEncoded(benchmark::State& state) {
+  const Folder folder(0);
+  const auto writeLog = [&](const char* name, const std::string& letters) {
+    std::ofstream log(folder.file(name));
+    log << "__REALTIME_TIMESTAMP=1700000000000000\nMESSAGE=";
+    for (std::int64_t i = 0; i < state.range(0); ++i) log << letters;
+    log << "\n\n";
+  };
+  writeLog("latin",
+           "gr\xFC\xDF"
+           "en ");
+  writeLog("ascii", "gruess ");
+  const auto exportOf = [&](const char* name) {
+    host::device().log = folder.file(name);
+    if (!OsLogStream::putOsLogStreamToFile(folder.file("out"), {}, {}, kAllHistory)) std::abort();
+  };
+  bench::compare(
+      state, [&] { exportOf("latin"); }, [&] { exportOf("ascii"); });
+}
+
 void BM_ExportMemory(benchmark::State& state) {
   const Folder folder(state.range(0));
   for ([[maybe_unused]] auto _ : state) state.counters["peak_MiB"] = peakMemory(folder);
@@ -100,6 +122,12 @@ void BM_ExportMemory(benchmark::State& state) {
 
 BENCHMARK(BM_ExportMemory)->SIZES->Iterations(1)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_Export)->SIZES->UseManualTime()->Iterations(5)->Unit(benchmark::kMillisecond);
+
+BENCHMARK(BM_ExportBadlyEncoded)
+    ->Arg(2'400'000)
+    ->UseManualTime()
+    ->Iterations(5)
+    ->Unit(benchmark::kMillisecond);
 
 }  // namespace
 

@@ -51,6 +51,10 @@ bool isAscii(std::string_view text) {
 std::size_t wellFormedLength(std::string_view text) {
   std::size_t length = 0;
   while (length < text.size()) {
+    if (static_cast<unsigned char>(text[length]) < 0x80) {
+      ++length;
+      continue;
+    }
     const Sequence sequence = firstSequence(text.substr(length));
     if (!sequence.wellFormed) break;
     length += sequence.length;
