@@ -122,6 +122,18 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
   });
 }
 
+TEST(RecordedLog, DamageSaysWhereItIs) {
+  const std::string log = kDate + "\nx";
+  RecordedLogReader reader(std::make_unique<Pieces>(log, 3));
+  ASSERT_EQ(reader.next(), EntryReader::Result::entry);
+  try {
+    reader.next();
+    FAIL();
+  } catch (const host::DamagedLog& damage) {
+    EXPECT_STREQ(damage.what(), "damaged at byte 39: not a field name");
+  }
+}
+
 TEST(RecordedLog, CutOffAnywhereLosesTheLastEntryAlone) {
   const std::string first = "-- Boot --\n" + kDate + "MESSAGE=one\n\n";
   const std::string second = kDate + binary("MESSAGE", "t\n\no") + "OTHER=1\n\n";

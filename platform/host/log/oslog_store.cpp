@@ -55,9 +55,9 @@ unsigned long deliverEvents(const Delivery& delivery) {
 }
 
 /// Writes to the system log why the log was not read to its end.
-void report(const std::exception& why) noexcept {
+void report(const char* why) noexcept {
   try {
-    platform::logError("Log not read to its end: " + std::string(why.what()));
+    platform::logError(std::string("Log not read to its end: ") + why);
   } catch (const std::bad_alloc&) {  // the reason code has to do
   }
 }
@@ -76,9 +76,11 @@ void run(Delivery delivery) {
     reason = deliverEvents(delivery);
   } catch (const host::DamagedLog& damage) {
     reason = host::kStreamDamaged;
-    report(damage);
+    report(damage.what());
+  } catch (const std::bad_alloc&) {
+    report("too little memory");
   } catch (const std::exception& failure) {
-    report(failure);
+    report(failure.what());
   }
   end(std::move(delivery), reason);
 }
@@ -114,7 +116,7 @@ class HostStream final : public OSLogEventStream {
     try {
       std::thread([handed] { run(std::move(*handed)); }).detach();
     } catch (const std::system_error& failure) {
-      report(failure);
+      report(failure.what());
       end(std::move(*handed), host::kStreamUnreadable);
     }
   }
