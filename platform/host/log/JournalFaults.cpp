@@ -60,7 +60,8 @@ class MapsFile {
 };
 
 /// Whether `address` lies in a shared map of the process. A line is "START-END rwxs ...".
-bool isInSharedMap(std::uintptr_t address) {
+bool isInSharedMap(const void* place) {
+  const auto address = reinterpret_cast<std::uintptr_t>(place);
   MapsFile maps;
   for (;;) {
     const std::uintptr_t start = maps.nextNumber();
@@ -76,9 +77,9 @@ bool isInSharedMap(std::uintptr_t address) {
 }
 
 /// Replaces the page around `address` by an empty one.
-bool putEmptyPage(std::uintptr_t address) {
+bool putEmptyPage(void* address) {
   const auto size = static_cast<std::uintptr_t>(::sysconf(_SC_PAGESIZE));
-  void* const page = reinterpret_cast<void*>(address / size * size);
+  void* const page = static_cast<char*>(address) - reinterpret_cast<std::uintptr_t>(address) % size;
   return ::mmap(page, size, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) == page;
 }
 
@@ -115,9 +116,8 @@ JournalFaults::~JournalFaults() {
 
 void JournalFaults::handle(int signal, siginfo_t* info, void* context) {
   const int error = errno;
-  const auto address = reinterpret_cast<std::uintptr_t>(info->si_addr);
-  if (ofThisThread != nullptr && info->si_code == BUS_ADRERR && isInSharedMap(address) &&
-      putEmptyPage(address)) {
+  if (ofThisThread != nullptr && info->si_code == BUS_ADRERR && isInSharedMap(info->si_addr) &&
+      putEmptyPage(info->si_addr)) {
     ofThisThread->faults = 1;
   } else {
     passOn(signal, info, context);

@@ -10,6 +10,7 @@
 #include <stdexcept>
 #include <string_view>
 #include <system_error>
+#include <utility>
 
 #include "platform/posix/Ascii.h"
 
@@ -103,19 +104,13 @@ std::vector<fs::path> filesOf(const std::string& journal) {
   return files;
 }
 
-/// What tells a file from all others, whatever its name.
-struct Identity {
-  explicit Identity(const struct stat& about) : device(about.st_dev), inode(about.st_ino) {}
-  auto operator<=>(const Identity&) const = default;
-
-  dev_t device;
-  ino_t inode;
-};
+/// What distinguishes a file from all others, whatever its name.
+using Identity = std::pair<dev_t, ino_t>;
 
 std::optional<Identity> identityOf(const fs::path& path) {
   struct stat about = {};
   if (::stat(path.c_str(), &about) != 0) return std::nullopt;
-  return Identity(about);
+  return Identity(about.st_dev, about.st_ino);
 }
 
 using Identities = std::vector<Identity>;
@@ -124,7 +119,8 @@ Identities identitiesOf(const std::vector<JournalFile>& files) {
   Identities identities;
   for (const JournalFile& file : files) {
     struct stat about = {};
-    if (::fstat(file.descriptor.get(), &about) == 0) identities.emplace_back(about);
+    if (::fstat(file.descriptor.get(), &about) == 0)
+      identities.emplace_back(about.st_dev, about.st_ino);
   }
   std::ranges::sort(identities);
   return identities;
