@@ -7,8 +7,8 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <regex>
 #include <set>
+#include <sstream>
 
 #include "platform/system.h"
 #include "tests/Program.h"
@@ -63,9 +63,10 @@ TEST(Program, ExportsTheLogOfARealMachine) {
   expectOutcome(run(start), {});
   EXPECT_EQ(readFile(folder.path("out")), readFile(data + "txt"));
   expectOutcome(run({{"logdump", "oslog", "600", folder.path("out")}}), {});
-  const std::regex date(R"(\d{4}-\d\d-\d\d \d\d:\d\d:\d\d)");
-  EXPECT_EQ(std::regex_replace(readFile(folder.path("out")), date, "DATE"),
-            readFile(ZUBTOOL_SOURCES "/tests/data/sample.txt"));
+  std::istringstream sample(readFile(folder.path("out")));
+  std::string undated;
+  for (std::string event; std::getline(sample, event);) undated += event.substr(20) + '\n';
+  EXPECT_EQ(undated, readFile(ZUBTOOL_SOURCES "/tests/data/sample.txt"));
   const auto own = folder.path("own");
   writeFile(own, readFile(data + "export"));
   expectOutcome(run({{"logdump", "oslog", "600", own}, "log = " + own}), {.status = 1});
