@@ -5,6 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -480,6 +481,11 @@ TEST_F(Journal, OutlivesFilesThatAreTruncatedWhileTheyAreRead) {
     EXPECT_EQ(delivered.reason, host::kStreamUnreadable) << moment << " " << size;
     EXPECT_GE(delivered.events.size(), moment);
   }
+  const auto meanOther = [&] {  // while the handler of such faults is there
+    std::signal(SIGBUS, [](int) { _exit(7); });
+    run(stream(kept), OSLogDate(0), [](std::size_t) { raise(SIGBUS); });
+  };
+  EXPECT_EXIT(meanOther(), testing::ExitedWithCode(7), "");
 }
 
 }  // namespace

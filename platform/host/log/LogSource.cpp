@@ -40,8 +40,12 @@ class TextBytes final : public ByteSource {
 /// The bytes that a descriptor gives: of a file, from its start, whoever else reads it.
 class DescriptorBytes final : public ByteSource {
  public:
-  DescriptorBytes(int opened, const StopSignal& signal)
-      : descriptor(opened), stop(signal), isFile(::lseek(opened, 0, SEEK_CUR) >= 0) {}
+  /// `name` is for errors.
+  DescriptorBytes(std::string name, int opened, const StopSignal& signal)
+      : path(std::move(name)),
+        descriptor(opened),
+        stop(signal),
+        isFile(::lseek(opened, 0, SEEK_CUR) >= 0) {}
 
   std::optional<std::size_t> read(char* buffer, std::size_t size) override {
     while (stop.waitReadable(descriptor)) {
@@ -52,13 +56,14 @@ class DescriptorBytes final : public ByteSource {
         return static_cast<std::size_t>(count);
       }
       if (errno != EINTR && errno != EAGAIN) {
-        throw std::system_error(errno, std::generic_category());
+        throw std::system_error(errno, std::generic_category(), path);
       }
     }
     return std::nullopt;
   }
 
  private:
+  std::string path;
   int descriptor;
   const StopSignal& stop;
   bool isFile;
@@ -76,15 +81,17 @@ class SampleSource final : public LogSource {
 
 class RecordedSource final : public LogSource {
  public:
-  explicit RecordedSource(posix::Descriptor opened) : descriptor(std::move(opened)) {}
+  RecordedSource(std::string name, posix::Descriptor opened)
+      : path(std::move(name)), descriptor(std::move(opened)) {}
 
   std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
                                     const StopSignal& stop) const override {
     return std::make_unique<RecordedLogReader>(
-        std::make_unique<DescriptorBytes>(descriptor.get(), stop));
+        std::make_unique<DescriptorBytes>(path, descriptor.get(), stop));
   }
 
  private:
+  std::string path;
   posix::Descriptor descriptor;
 };
 
@@ -128,7 +135,7 @@ std::shared_ptr<LogSource> prepareLog(const std::string& log) {
   if (S_ISDIR(about.st_mode) || isJournalFile(opened.get())) {
     return std::make_shared<JournalSource>(log);
   }
-  return std::make_shared<RecordedSource>(std::move(opened));
+  return std::make_shared<RecordedSource>(log, std::move(opened));
 }
 
 }  // namespace host
