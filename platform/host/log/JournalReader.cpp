@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <new>
 #include <span>
 #include <stdexcept>
 #include <string>
@@ -115,6 +116,8 @@ class JournalReader final : public EntryReader {
     return Result::stopped;
   } catch (const DamagedLog&) {
     throw;
+  } catch (const std::bad_alloc&) {
+    throw;
   } catch (const std::exception& error) {
     checkFiles();  // may know which file it is
     throw std::runtime_error(std::string(kCannotRead) + error.what());
@@ -123,6 +126,7 @@ class JournalReader final : public EntryReader {
  private:
   void begin() {
     begun = true;
+    journal.check(::sd_journal_set_data_threshold(journal.get(), kFirstPart));
     mayHaveMore = addMatches();
     if (from.microsecondsSince1970() > 0) {
       const auto since = static_cast<std::uint64_t>(from.microsecondsSince1970());
