@@ -37,7 +37,7 @@ bool CommandShell::run(std::list<std::string> words) {
 }
 
 /// Prompts and runs lines until one of them quits, or standard input ends, which is a failure. A
-/// line for which there is too little memory is given up.
+/// line for which there is too little memory is refused.
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
     currentCommand = promptCommand;

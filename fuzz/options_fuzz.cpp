@@ -1,4 +1,4 @@
-// Any words behind a collection's name, and the path that its logs get.
+// Any words after a collection's name, and the path that its logs get.
 
 #include <cstdint>
 #include <cstdlib>

@@ -38,36 +38,36 @@ void require(bool holds) {
   if (!holds) std::abort();
 }
 
-void add(std::string& told, std::string_view text) {
+void add(std::string& seen, std::string_view text) {
   require(posix::isUtf8(text));
-  told.append(text).append("|");
+  seen.append(text).append("|");
 }
 
-void addAll(std::string& told, const host::LogEvent& event, const host::EventFilter& filter) {
-  add(told, event.process());
-  add(told, event.sender());
-  add(told, event.subsystem());
-  add(told, event.category());
-  add(told, event.composedMessage());
-  add(told, event.senderImagePath());
-  event.date().appendDescription(told);
-  told += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
-  told += std::to_string(event.processIdentifier());
-  told += std::to_string(event.timeZone().secondsFromGMT(event.date()));
-  told += filter.passes(event) ? '+' : '-';
+void addAll(std::string& seen, const host::LogEvent& event, const host::EventFilter& filter) {
+  add(seen, event.process());
+  add(seen, event.sender());
+  add(seen, event.subsystem());
+  add(seen, event.category());
+  add(seen, event.composedMessage());
+  add(seen, event.senderImagePath());
+  event.date().appendDescription(seen);
+  seen += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
+  seen += std::to_string(event.processIdentifier());
+  seen += std::to_string(event.timeZone().secondsFromGMT(event.date()));
+  seen += filter.passes(event) ? '+' : '-';
 }
 
 /// All that the log says.
 std::string read(std::string_view log, std::size_t piece, const host::EventFilter& filter) {
   host::RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
   const host::LogEvent event(reader.entry());
-  std::string told;
+  std::string seen;
   try {
-    while (reader.next() == EntryReader::Result::entry) addAll(told, event, filter);
+    while (reader.next() == EntryReader::Result::entry) addAll(seen, event, filter);
   } catch (const host::DamagedLog& damage) {
-    told += damage.what();
+    seen += damage.what();
   }
-  return told;
+  return seen;
 }
 
 /// A run of one byte, so long that it and what surrounds it end near the end of the buffer.

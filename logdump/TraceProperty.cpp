@@ -25,7 +25,7 @@ Word ReadWord(const std::string& value) {
   return Word::none;
 }
 
-/// The base that the prefix of a number tells. Not left to strtoll, which knows more prefixes in
+/// The base that the prefix of a number means. Not left to strtoll, which knows more prefixes in
 /// newer C libraries.
 int BaseOf(std::string_view number) {
   number.remove_prefix(std::min(number.find_first_not_of(" \t\n\v\f\r"), number.size()));

@@ -33,14 +33,14 @@ class LineFile {
     return failure;
   }
 
-  /// Closes the file for the want of a line that should be in it.
+  /// Closes the file because a line is missing from it.
   void fail() {
     failed = true;
     close();
   }
 
-  /// Does not wait for a line that is being written, for a stalled reader may hold it up for good:
-  /// the file then closes behind that line.
+  /// Does not wait for a line that is being written, which a stalled reader may hold up without
+  /// end: the file then closes after that line.
   void close() {
     closing = true;
     if (const std::unique_lock lock(mutex, std::try_to_lock); lock) file.reset();

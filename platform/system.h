@@ -6,7 +6,7 @@
 #include <system_error>
 
 /// The name under which the program was invoked, without its folder. Owned by the C library, as
-/// in getprogname(3) of the BSDs. Any thread.
+/// in getprogname(3) of the BSDs.
 extern "C" const char* getprogname();
 
 namespace platform {
@@ -26,8 +26,6 @@ void runMainEventLoop();
 void openStandardStreams();
 
 /// A file open for writing at its end; it closes when destroyed.
-///
-/// Threads: one at a time.
 class FileHandle {
  public:
   /// Opens the file at `path` and empties it, or makes it, for its owner alone. A device or a pipe
@@ -47,7 +45,6 @@ class FileHandle {
 };
 
 /// Writes `message` to the system log's default log object at error level. Never to the terminal.
-/// Any thread.
 void logError(const std::string& message);
 
 }  // namespace platform

@@ -4,7 +4,7 @@
 #include <string_view>
 
 /// UTF-8 as the Unicode standard defines it: no overlong forms, no surrogates, nothing beyond
-/// U+10FFFF. Every function takes any bytes. Threads: any.
+/// U+10FFFF. Every function takes any bytes.
 namespace posix {
 
 /// True when all of `text` is well-formed. Runs of ASCII cost next to nothing.

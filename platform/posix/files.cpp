@@ -36,7 +36,6 @@ bool empty(const posix::Descriptor& opened) {
 
 std::unique_ptr<FileHandle> FileHandle::createEmpty(const std::string& path) {
   constexpr mode_t kForItsOwner = 0600;
-  if (posix::isReadByDevice(path)) return nullptr;
   auto opened = posix::openForAppending(path, kForItsOwner);
   if (!opened || !empty(opened)) return nullptr;
   return std::make_unique<AppendedFile>(std::move(opened));
@@ -49,7 +48,12 @@ posix::Descriptor posix::openForAppending(const std::string& path, mode_t mode) 
     errno = EINVAL;
     return Descriptor();
   }
-  // Always with O_CREAT: the system then refuses what others have laid out in a sticky directory.
+  if (isReadByDevice(path)) {
+    errno = EPERM;
+    return Descriptor();
+  }
+  // Always with O_CREAT: the system then refuses a file that others have planted in a sticky
+  // directory.
   return Descriptor(
       open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, mode));
 }

@@ -6,8 +6,6 @@
 
 /// read(2) and write(2) for descriptors that may be shared with other programs, which may have made
 /// them not block: those are waited for, without end and without changing them.
-///
-/// Threads: any.
 namespace posix {
 
 /// Writes all of `bytes`: in one system call where the system takes them so, and what a short write

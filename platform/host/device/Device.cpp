@@ -36,6 +36,7 @@ Profile* loadProfile() {
   auto* const profile = new Profile;
   const char* const file = std::getenv("ZUB_DEVICE");
   if (!file || !*file) return profile;
+  profile->file = file;
   if (const auto wrong = parseProfile(readProfileText(file), file, *profile)) refuse(*wrong);
   return profile;
 }

@@ -33,6 +33,8 @@ enum class Build { internal, carrier, customer };
 
 /// One device, as a profile describes it. The defaults are a phone on which everything works.
 struct Profile {
+  std::string file;  ///< the path that the profile was read from; empty for none
+
   int radio = 1;
   int product = static_cast<int>(TelephonyProduct::Phone);
   int radioVendor = 1;

@@ -4,7 +4,7 @@
 
 #include "platform/lumo.h"
 
-/// The file in which the device records what is asked of it. Threads: any.
+/// The file in which the device records what is asked of it.
 namespace host {
 
 /// A request's dictionary as the request log shows it: {Key="text", Other=1}, with \", \\ and \n in
@@ -12,7 +12,7 @@ namespace host {
 std::string describe(const lumo::dict& request);
 
 /// Appends `line` to the device's request log, if it keeps one. When that fails it says why on
-/// standard error, and the device goes on. Threads: any.
+/// standard error, and the device goes on.
 void recordRequest(const std::string& line);
 
 }  // namespace host

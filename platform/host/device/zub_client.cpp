@@ -94,8 +94,8 @@ class Manager {
 
 namespace {
 
-/// Keeps every manager, and so its handlers, for good, as the contract says of the handlers. Never
-/// destroyed: queues outlive exit.
+/// Keeps every manager, and so its handlers, until exit, as the contract says of the handlers.
+/// Never destroyed: queues outlive exit.
 void keepForGood(const std::shared_ptr<Manager>& manager) {
   static auto* const mutex = new std::mutex;
   static auto* const managers = new std::vector<std::shared_ptr<Manager>>;

@@ -5,7 +5,7 @@
 
 namespace host {
 
-/// Where the bytes of a log come from. Threads: one at a time.
+/// Where the bytes of a log come from.
 class ByteSource {
  public:
   virtual ~ByteSource() = default;

@@ -37,7 +37,7 @@ class MapsFile {
     return count > 0 ? buffer[static_cast<std::size_t>(position++)] : '\0';
   }
 
-  /// The hexadecimal number at the position, and the byte behind it, which is taken.
+  /// The hexadecimal number at the position, and the byte after it, which is consumed.
   std::uintptr_t nextNumber() {
     std::uintptr_t number = 0;
     for (;;) {

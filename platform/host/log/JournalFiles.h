@@ -12,7 +12,7 @@
 /// them. Of this machine's journal, /var/log/journal has only the folder of its own ID.
 ///
 /// `journal` is the path of a folder or of one journal file; empty stands for this machine's
-/// journal. Threads: any.
+/// journal.
 namespace host {
 
 /// A file of a journal, open for reading. It stays what it is when the journal is rotated.

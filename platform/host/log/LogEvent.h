@@ -25,9 +25,8 @@ namespace host {
 ///   SYSLOG_IDENTIFIER
 /// - message: MESSAGE
 ///
-/// An event is a view of an entry, which may change under it: what it tells is what the entry holds
+/// An event is a view of an entry, which may change under it: it reports what the entry holds
 /// when it is asked. Texts are valid until the entry changes or the same text is asked for again.
-/// Threads: one at a time.
 class LogEvent final : public OSLogEventProxy {
  public:
   explicit LogEvent(const LogEntry& shown) : entry(shown) {}

@@ -91,7 +91,7 @@ void ReadAhead::handOver() {
   changed.notify_one();
   filling.events.clear();
   filling.bytes.clear();
-  // What a huge event has left behind is not held for good.
+  // The buffer of a huge event is not kept.
   if (filling.bytes.capacity() > kBatchBytes) filling.bytes = std::vector<char>();
 }
 

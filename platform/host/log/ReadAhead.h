@@ -15,12 +15,12 @@
 
 namespace host {
 
-/// An event with all its parts worked out, apart from the entry that it came from. What its texts
-/// refer to belongs to whoever made it.
+/// An event with all its parts decoded, independent of its entry. Its texts belong to whoever made
+/// it.
 ///
-/// An event takes three forms: a `LogEntry` is the fields as the reader has them; a `LogEvent` is
-/// a view of one, which works out a part when it is asked, and of most entries a filter asks but
-/// one or two; a `FinishedEvent` is what goes over to another thread.
+/// An event takes three forms: a `LogEntry` is the fields as the reader has them; a `LogEvent` is a
+/// view of one, which decodes a part when it is asked, since a filter asks most entries for one or
+/// two; a `FinishedEvent` is what is handed to another thread.
 class FinishedEvent final : public OSLogEventProxy {
  public:
   explicit FinishedEvent(const LogEvent& event);
@@ -53,9 +53,9 @@ class FinishedEvent final : public OSLogEventProxy {
 /// Reads a log and decodes its events on a thread of its own, a little ahead of whoever takes
 /// them: to read and to use a log take about as long, and can be done at the same time.
 ///
-/// Events go over in batches. What has been read goes over before the reader waits for more, so
-/// that no entry waits for one that comes later; and there are three batches in all, so that the
-/// thread is never more than two ahead.
+/// Events are handed over in batches. What has been read is handed over before the reader waits for
+/// more, so that no entry waits for a later one; there are three batches in all, so the thread is
+/// never more than two ahead.
 ///
 /// Threads: all members belong to one thread.
 class ReadAhead {

@@ -142,7 +142,7 @@ bool RecordedLogReader::readBinary(Field field) {
     takePiece(field, static_cast<std::size_t>(length));
     endPieces(field);
   }
-  if (*position != '\n') damagedBy("no newline behind a binary field");
+  if (*position != '\n') damagedBy("no newline after a binary field");
   ++position;
   return true;
 }

@@ -15,15 +15,15 @@ namespace host {
 
 /// Reads a log in the Journal Export Format, one entry after the other, from any bytes at all.
 ///
-/// An entry is whole when the empty line behind it has been read, and only whole entries are
-/// given. So a log that stops anywhere else is cut, be it behind the line of a field: its last
-/// entry is dropped and its end is damage. A log of no bytes is whole.
+/// An entry ends with an empty line. A log that stops anywhere else, even after the line of a
+/// field, is cut off: its last entry is dropped, and its end is damage. A log of no bytes is
+/// complete.
 ///
-/// Damage is, besides: a field name that is empty, longer than kMaxName, or not of A-Z, 0-9 and _;
-/// wanted fields longer than an entry may have; a binary field without a newline behind it.
+/// Damage is also: a field name that is empty, longer than kMaxName, or not of A-Z, 0-9 and _;
+/// wanted fields longer than an entry may have; a binary field without a newline after it.
 ///
-/// Skipped without a word: an entry that has no date or one that cannot be read, and, between
-/// entries, empty lines and lines that start with "-- ", which journalctl puts there for a reboot.
+/// Skipped silently: an entry without a valid date and, between entries, empty lines and lines that
+/// start with "-- ", which journalctl writes at a reboot.
 ///
 /// Memory is one buffer, and copies of those wanted fields that do not fit into it.
 class RecordedLogReader final : public EntryReader {
@@ -41,7 +41,7 @@ class RecordedLogReader final : public EntryReader {
   bool readDate();
 
   // Each of these is false when nothing more is to be read, with `outcome` set. `field` is none
-  // where the value is not wanted; `lineEnd` is `limit` where the line goes on behind it.
+  // where the value is not wanted; `lineEnd` is `limit` where the line continues after it.
   bool readField();
   bool skipSeparator(const char* lineEnd);
   bool readText(Field field, const char* lineEnd);
