@@ -2,10 +2,23 @@
 
 _zubtool() {
   local IFS=$' \t\n' current=${COMP_WORDS[COMP_CWORD]} word
-  local offered='' group=()  # group: the words typed so far of the command, which "--" ends
+  local offered='' group=() file=  # group: the words typed so far of the command, which "--" ends
   for word in "${COMP_WORDS[@]:1:COMP_CWORD-1}"; do
-    if [[ $word == -- ]]; then group=(); else group+=("$word"); fi
+    if [[ $file ]]; then
+      file=
+    elif [[ $word == *[\<\>]* ]]; then
+      file=next
+    elif [[ $word == -- ]]; then
+      group=()
+    else
+      group+=("$word")
+    fi
   done
+  if [[ $file || $current == [\$\<\>]* ]]; then  # a redirection's file, a variable: bash's own
+    COMPREPLY=()
+    compopt -o default
+    return
+  fi
 
   case "${group[*]:0:2}" in
     '') offered='logdump cd help back quit exit' ;;
@@ -17,7 +30,7 @@ _zubtool() {
       case ${#group[@]} in
         2) offered='600 3600 86400' ;;
         3) compopt -o default ;;  # a path
-        *) offered='-p -i --' ;;
+        *) [[ ${group[-1]} == -[pi] ]] || offered='-p -i --' ;;
       esac
       ;;
     *) offered='--' ;;

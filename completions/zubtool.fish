@@ -1,7 +1,8 @@
 # Completion of zubtool(1) for fish.
 
-function __zubtool_offer
-    set -l group # the words typed so far of the command, which "--" ends
+# Prints the words typed so far of the command, which "--" ends.
+function __zubtool_group
+    set -l group
     for word in (commandline -opc)[2..]
         if test "$word" = --
             set group
@@ -9,6 +10,16 @@ function __zubtool_offer
             set -a group $word
         end
     end
+    string join \n -- $group
+end
+
+function __zubtool_at_path
+    set -l group (__zubtool_group)
+    test "$group[1..2]" = 'logdump oslog' -a (count $group) -eq 3
+end
+
+function __zubtool_offer
+    set -l group (__zubtool_group)
 
     set -l compression \
         nocompress\t'leave the logs as they are' \
@@ -43,9 +54,11 @@ function __zubtool_offer
             switch (count $group)
                 case 2
                     set offered 600\t'ten minutes' 3600\t'an hour' 86400\t'a day'
-                case 3
-                    set offered (__fish_complete_path (commandline -ct))
+                case 3 # a path, which fish itself completes
+                    return
                 case '*'
+                    contains -- $group[-1] -p -i # a name, which only the user knows
+                    and return
                     set offered -p\t'names of processes' -i\t'texts in paths of images' $next
             end
     end
@@ -58,4 +71,6 @@ function __zubtool_offer
     printf '%s\n' $offered
 end
 
-complete -c zubtool -f -k -a '(__zubtool_offer)'
+complete -c zubtool -n 'not __zubtool_at_path' -f
+complete -c zubtool -n __zubtool_at_path -F
+complete -c zubtool -k -a '(__zubtool_offer)'

@@ -26,6 +26,6 @@ case $shell in
   fish)
     HOME=/dev/null fish --no-config -c '
       source ./zubtool.fish
-      complete -C "zubtool $argv " | string replace -r "\t.*" ""' -- "$@"
+      complete -C "zubtool $argv " | string replace -r "\t.*" ""; true' -- "$@"
     ;;
 esac

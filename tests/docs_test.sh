@@ -59,6 +59,7 @@ check_completion() {  # SHELL
   check_offer "$1" 'zubtool logdump bb NONUI Tar tar.gz nocompress' \
     "${tree[zubtool logdump bb]-}"$'\n--'
   check_offer "$1" 'zubtool logdump tel why' '--'
+  check_offer "$1" 'zubtool logdump oslog 600 out.txt -p a -i' ''
   check_offer "$1" 'zubtool logdump tel -- cd' "${tree[zubtool cd]}"
 }
 
