@@ -1,5 +1,16 @@
 #include "framework/CommandBase.h"
 
+namespace {
+
+template <class Value>
+std::set<std::string> NamesOf(const std::map<std::string, Value>& table) {
+  std::set<std::string> names;
+  for (const auto& [name, value] : table) names.insert(name);
+  return names;
+}
+
+}  // namespace
+
 void CommandBase::init() {
   const auto above = parent.lock();
   if (above) hierarchy = above->hierarchy;
@@ -31,6 +42,22 @@ bool CommandBase::isValidSubCommand(const std::string& name) const {
 std::shared_ptr<CommandBase> CommandBase::getSubCommandObj(const std::string& name) const {
   const auto found = subCommands.find(name);
   return found != subCommands.end() ? found->second : nullptr;
+}
+
+std::shared_ptr<CommandBase> CommandBase::getNodeAt(const std::string& element) {
+  if (auto child = getSubCommandObj(element)) return child;
+  if (element != "..") return nullptr;
+  const auto above = parent.lock();
+  return above ? above : shared_from_this();
+}
+
+std::set<std::string> CommandBase::getCommandNames() const { return NamesOf(commandHandlers); }
+
+std::set<std::string> CommandBase::getSubCommandNames() const { return NamesOf(subCommands); }
+
+std::string CommandBase::getHelpText(const std::string& name) const {
+  const auto found = commandHelp.find(name);
+  return found != commandHelp.end() ? found->second : "";
 }
 
 bool CommandBase::execCommand(const std::string& name, const std::list<std::string>& words) const {

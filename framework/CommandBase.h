@@ -3,6 +3,7 @@
 #include <list>
 #include <map>
 #include <memory>
+#include <set>
 #include <string>
 
 #include "platform/dispatch.h"
@@ -55,6 +56,16 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
 
   /// The child registered under `name`, or an empty pointer.
   std::shared_ptr<CommandBase> getSubCommandObj(const std::string& name) const;
+
+  /// Where `element` of a "cd" path leads: to the child registered under it; for "..", to the node
+  /// one level up, or this one where there is none. Empty when it leads nowhere.
+  std::shared_ptr<CommandBase> getNodeAt(const std::string& element);
+
+  std::set<std::string> getCommandNames() const;     ///< of the handlers
+  std::set<std::string> getSubCommandNames() const;  ///< of the children
+
+  /// The help text of the handler called `name`; empty where it has none.
+  std::string getHelpText(const std::string& name) const;
 
   /// Runs the handler called `name` on this thread and returns its result, once all the work that
   /// it put on its task group has ended; there is no time-out. Without such a handler, or without

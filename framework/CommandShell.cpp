@@ -4,6 +4,7 @@
 #include <limits>
 #include <new>
 
+#include "framework/Completion.h"
 #include "framework/WordList.h"
 
 namespace {
@@ -41,15 +42,28 @@ bool CommandShell::run(std::list<std::string> words) {
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
     currentCommand = promptCommand;
-    std::cout << '(' << currentCommand->getHierarchy() << ")>> " << std::flush;
     try {
       std::string line;
-      if (!ReadTypedLine(line)) return Outcome::failed;
+      if (!readLine(line)) return Outcome::failed;
       if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
     } catch (const std::bad_alloc&) {
       std::cerr << "Not enough memory for this line" << std::endl;
     }
   }
+}
+
+/// Prompts and reads a line, edited where the reader of the shell can do that. False at the end.
+bool CommandShell::readLine(std::string& line) const {
+  const auto prompt = '(' + promptCommand->getHierarchy() + ")>> ";
+  if (readEdited) {
+    std::cout << std::flush;
+    const auto complete = [this](const std::string& typed) {
+      return CompleteLine(promptCommand, typed);
+    };
+    if (const auto isLine = readEdited(prompt, complete, line)) return *isLine;
+  }
+  std::cout << prompt << std::flush;
+  return ReadTypedLine(line);
 }
 
 /// Runs the groups of `words` until one does not succeed.
@@ -115,13 +129,9 @@ CommandShell::Outcome CommandShell::changeDirectory(const std::list<std::string>
 /// runs nothing, so no node is asked for permission.
 bool CommandShell::followPath(const std::string& path) {
   for (const auto& element : splitCmdPath(path)) {
-    if (currentCommand->isValidSubCommand(element)) {
-      currentCommand = currentCommand->getSubCommandObj(element);
-    } else if (element == "..") {
-      if (const auto above = currentCommand->getParent().lock()) currentCommand = above;
-    } else {
-      return false;
-    }
+    auto next = currentCommand->getNodeAt(element);
+    if (!next) return false;
+    currentCommand = std::move(next);
   }
   return true;
 }

@@ -1,8 +1,11 @@
 #pragma once
 
+#include <functional>
 #include <list>
 #include <memory>
+#include <optional>
 #include <string>
+#include <vector>
 
 #include "framework/CommandBase.h"
 
@@ -10,10 +13,25 @@
 /// that names the node where it stands.
 ///
 /// A subclass supplies the tree. Threads: one, on which every handler runs as well. It writes to
-/// standard output and error and reads standard input through the standard streams.
+/// standard output and error and reads standard input through the standard streams, except for
+/// lines that a person edits.
 class CommandShell {
  public:
+  /// What may stand in place of the last word of a line up to its cursor (see Completion.h).
+  using Completer = std::function<std::vector<std::string>(const std::string& typed)>;
+
+  /// Shows the prompt and has a person edit a line, which it leaves, without its line end, in the
+  /// empty `line`. True for a line, false when the input has ended; nothing, before it has shown or
+  /// read anything, where no line can be edited.
+  using LineReader = std::function<std::optional<bool>(
+      const std::string& prompt, const Completer& complete, std::string& line)>;
+
   CommandShell() = default;
+
+  /// Lines are read with `readEdited`, and where that can edit none, or is empty, from standard
+  /// input as they are.
+  explicit CommandShell(LineReader readEdited) : readEdited(std::move(readEdited)) {}
+
   CommandShell(const CommandShell&) = delete;
   CommandShell& operator=(const CommandShell&) = delete;
   virtual ~CommandShell() = default;
@@ -40,6 +58,7 @@ class CommandShell {
   static Outcome outcomeOf(bool success) { return success ? Outcome::succeeded : Outcome::failed; }
 
   Outcome runLines();
+  bool readLine(std::string& line) const;
   Outcome runBatch(const std::list<std::string>& words);
   Outcome runGroup(std::list<std::string> words);
   Outcome runShellWord(const std::string& word, bool isLast, bool isWholeGroup);
@@ -50,4 +69,5 @@ class CommandShell {
   std::shared_ptr<CommandBase> rootCommand;
   std::shared_ptr<CommandBase> promptCommand;   // where the prompt stands; empty in a one-shot run
   std::shared_ptr<CommandBase> currentCommand;  // where the next word is looked up
+  const LineReader readEdited;
 };

@@ -1,11 +1,13 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <filesystem>
 #include <functional>
 #include <iostream>
 #include <sstream>
 
 #include "framework/CommandShell.h"
+#include "framework/Completion.h"
 #include "framework/WordList.h"
 #include "tests/CapturedOutput.h"
 #include "tests/Table.h"
@@ -92,6 +94,7 @@ void buildTree(Node& root) {
 
 class TestShell : public CommandShell {
  public:
+  using CommandShell::CommandShell;
   bool hasTree = true;
 
  private:
@@ -120,6 +123,40 @@ TEST(Shell, RunsCommandLinesAndTypedLines) {
       EXPECT_EQ(out.str(), row[1]);
     });
   }
+}
+
+TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
+  const auto root = Node::create("r", {}, [](Node& node) {
+    buildTree(node);
+    node.handler("opt", true, "[fast|slow|tar.gz] <why> does [it]");
+    node.handler("out", true, "[how many] [output file path] -p <a b..> -i <c> writes -x");
+  });
+  const auto before = std::filesystem::current_path();
+  std::filesystem::current_path(ZUBTOOL_SOURCES "/tests/tables");
+  const CapturedOutput out;
+  forEachRow("completion", 2, [&root](const Row& row) {
+    std::string offered;
+    for (const auto& word : CompleteLine(root, row[0]))
+      offered += (offered.empty() ? "" : " ") + word;
+    EXPECT_EQ(offered, row[1] == " " ? "" : row[1]);
+  });
+  std::filesystem::current_path(before);
+  EXPECT_EQ(out.str(), "");
+}
+
+TEST(Shell, ReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
+  std::vector<std::optional<bool>> answers = {true, std::nullopt, false};
+  TestShell shell([&](const std::string& prompt, const auto& complete, std::string& line) {
+    std::cout << prompt << complete("a").front() << ' ';
+    const auto answer = answers.front();
+    answers.erase(answers.begin());
+    line = answer ? "cd s" : "";
+    return answer;
+  });
+  const CapturedOutput out;
+  const TypedInput in("a\n");
+  EXPECT_FALSE(shell.run({"r"}));
+  EXPECT_EQ(out.str(), "(/r)>> a (/r/s)>> a (/r/s)>> ?a /r/s:a() (/r/s)>> a ");
 }
 
 TEST(Shell, NeedsATreeButNoProgramName) {
