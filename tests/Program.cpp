@@ -73,6 +73,7 @@ void Program::execute(const Start& start, int input, int output) const {
     dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }
   setenv("TZ", "UTC", 1);
+  setenv("TERM", start.term.c_str(), 1);
   setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
   std::vector<std::string> command = {ZUBTOOL_EMULATOR};
   const bool isEmulated = !command.front().empty();

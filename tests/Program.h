@@ -31,7 +31,8 @@ struct Start {
   std::string profile = {};                          ///< text of the device profile
   std::optional<std::string> input = std::string();  ///< standard input; none: it is closed
   std::string name = "zubtool";                      ///< under which the program is invoked
-  bool onTerminal = false;  ///< a pseudo-terminal stands for all three standard streams
+  bool onTerminal = false;    ///< a pseudo-terminal stands for all three standard streams
+  std::string term = "dumb";  ///< the kind of terminal, TERM
 };
 
 /// What one run of the program left behind.
@@ -60,6 +61,7 @@ class Program {
   Outcome finish();
 
   pid_t pid() const { return process; }
+  int terminal() const { return out; }  ///< its controlling side, where the program has one
 
  private:
   [[noreturn]] void execute(const Start& start, int input, int output) const;

@@ -4,6 +4,7 @@
 #include <system_error>
 
 #include "platform/system.h"
+#include "platform/terminal.h"
 #include "platform/zub_client.h"
 #include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"
@@ -41,6 +42,8 @@ std::shared_ptr<CommandBase> Connect() {
 }
 
 }  // namespace
+
+ZUBShell::ZUBShell() : CommandShell(platform::readEditedLine) {}
 
 std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
   try {

@@ -1,0 +1,7 @@
+#include "platform/terminal.h"
+
+std::optional<bool> platform::readEditedLine(const std::string& /*prompt*/,
+                                             const LineCompleter& /*complete*/,
+                                             std::string& /*line*/) {
+  return std::nullopt;
+}

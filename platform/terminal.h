@@ -1,0 +1,30 @@
+#pragma once
+
+#include <functional>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace platform {
+
+/// What may stand in place of the last word of `typed`, a line up to its cursor: words that start
+/// with that word, which is empty where `typed` ends in white space. One that ends in "/" may go
+/// on; after any other comes a blank.
+using LineCompleter = std::function<std::vector<std::string>(const std::string& typed)>;
+
+/// Shows `prompt` on the terminal and has a person edit a line there, with keys to move about, a
+/// history of the lines before, and `complete` for Tab. Leaves the line in `line`, without its line
+/// end, each byte as it was typed.
+///
+/// True for a line; false when the input has ended. Nothing, with nothing shown or read, when there
+/// is no terminal to edit on: standard input or standard output is none, TERM is not set, not known
+/// or "dumb", or the port has no line editing. That answer stays the same while the program runs.
+///
+/// The terminal's settings are other than before while this waits for keys, and at no other time:
+/// they are back before it returns, and however the process ends or stops meanwhile, save by a
+/// signal that no program can handle. Signals do what they do without it. What standard output was
+/// given before must have been flushed. Threads: one, any; `complete` runs on it.
+std::optional<bool> readEditedLine(const std::string& prompt, const LineCompleter& complete,
+                                   std::string& line);
+
+}  // namespace platform
