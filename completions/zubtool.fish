@@ -42,7 +42,7 @@ function __zubtool_offer
         case logdump
             set offered \
                 bb\t'collect baseband logs only' \
-                core\t'collect telephony logs with coredump' \
+                core\t'collect telephony logs with coredump; resets the baseband' \
                 oslog\t'collect oslog to txt' \
                 tel\t'collect telephony logs' \
                 help\t'list commands'
