@@ -15,6 +15,8 @@
 #include "platform/host/Libedit.h"
 #include "platform/host/TerminalSession.h"
 #include "platform/host/WideText.h"
+#include "platform/posix/Utf8.h"
+#include "platform/posix/transfer.h"
 
 namespace {
 
@@ -215,12 +217,7 @@ int Editor::readCharacter(wchar_t& character) {
   while (received.empty()) {
     waitForInput(-1);
     if (!readByte()) return 0;
-    const auto lead = static_cast<unsigned char>(sequence[0]);
-    const std::size_t length = lead < 0xC2 || lead > 0xF4 ? 1
-                               : lead < 0xE0              ? 2
-                               : lead < 0xF0              ? 3
-                                                          : 4;
-    while (sequence.size() < length && (sequence.back() & 0x80) != 0 &&
+    while (sequence.size() < posix::utf8Length(sequence[0]) && (sequence.back() & 0x80) != 0 &&
            waitForInput(kRestOfSequence) == TerminalSession::Event::input && readByte()) {
     }
     received = toWide(sequence);
@@ -245,7 +242,7 @@ TerminalSession::Event Editor::waitForInput(int milliseconds) {
 /// Reads one byte, and no more: what follows the line may be for another program.
 bool Editor::readByte() {
   char byte = 0;
-  if (::read(STDIN_FILENO, &byte, 1) != 1) return false;
+  if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return false;
   sequence += byte;
   return true;
 }

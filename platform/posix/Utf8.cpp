@@ -12,23 +12,18 @@ struct Sequence {
   bool wellFormed;
 };
 
-/// The length that a lead byte announces; 0 for a byte that leads nothing.
-std::size_t announcedLength(unsigned char lead) {
-  if (lead < 0x80) return 1;
-  if (lead < 0xC2) return 0;
-  if (lead < 0xE0) return 2;
-  if (lead < 0xF0) return 3;
-  return lead < 0xF5 ? 4 : 0;
-}
-
 /// The well-formed sequence at the start of `text`, or the maximal subpart of an ill-formed one.
 Sequence firstSequence(std::string_view text) {
   const auto lead = static_cast<unsigned char>(text[0]);
-  const std::size_t length = announcedLength(lead);
+  const std::size_t length = utf8Length(text[0]);
   if (length == 0) return {1, false};
   // What excludes overlong forms, surrogates and the codes beyond U+10FFFF is the second byte.
-  unsigned char low = lead == 0xE0 ? 0xA0 : lead == 0xF0 ? 0x90 : 0x80;
-  unsigned char high = lead == 0xED ? 0x9F : lead == 0xF4 ? 0x8F : 0xBF;
+  unsigned char low = 0x80;
+  unsigned char high = 0xBF;
+  if (lead == 0xE0) low = 0xA0;
+  if (lead == 0xED) high = 0x9F;
+  if (lead == 0xF0) low = 0x90;
+  if (lead == 0xF4) high = 0x8F;
   for (std::size_t i = 1; i < length; ++i) {
     if (i == text.size()) return {i, false};
     const auto byte = static_cast<unsigned char>(text[i]);
@@ -63,6 +58,15 @@ std::size_t wellFormedLength(std::string_view text) {
 }
 
 }  // namespace
+
+std::size_t utf8Length(char lead) {
+  const auto byte = static_cast<unsigned char>(lead);
+  if (byte < 0x80) return 1;
+  if (byte < 0xC2) return 0;
+  if (byte < 0xE0) return 2;
+  if (byte < 0xF0) return 3;
+  return byte < 0xF5 ? 4 : 0;
+}
 
 bool isUtf8(std::string_view text) {
   return isAscii(text) || wellFormedLength(text) == text.size();

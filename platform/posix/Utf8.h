@@ -15,6 +15,9 @@ bool isUtf8(std::string_view text);
 /// The result is valid as long as what it refers to; `text` must not lie in `storage`.
 std::string_view asUtf8(std::string_view text, std::string& storage);
 
+/// The length in bytes of the sequence that `lead` starts; 0 for a byte that starts none.
+std::size_t utf8Length(char lead);
+
 /// Takes the first code point off `text`, which must not be empty. An ill-formed sequence is taken
 /// as one U+FFFD, divided as above.
 char32_t takeCodePoint(std::string_view& text);
