@@ -3,6 +3,6 @@
 #include "tests/Program.h"
 
 TEST(SmallestPort, RefusesToStart) {
-  EXPECT_EQ(run({{"help"}}),
-            (Outcome{.out = "'zubtool' is not supported on this product.\n", .status = 255}));
+  expectOutcome(run({{"help"}}),
+                {.out = "'zubtool' is not supported on this product.\n", .status = 255});
 }
