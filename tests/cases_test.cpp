@@ -20,35 +20,28 @@ const std::string kFolder = ZUBTOOL_SOURCES "/tests/cases/";
 struct Case {
   std::string name;
   int line;
+  std::map<std::string, std::string> device = {};  ///< lines of the profile by their keys
   Start start = {};
   Outcome expected = {};
-  std::string faults = {};  ///< what is wrong with how it is written
 };
 
-/// Sets a line "KEY = VALUE" of a profile, in the place of an earlier one with that key.
-void setDevice(std::string& profile, const std::string& line) {
-  const auto equals = line.find('=');
-  const auto key = "\n" + line.substr(0, equals) + "=";
-  const auto before = equals == std::string::npos ? equals : ("\n" + profile).find(key);
-  if (before == std::string::npos) {
-    profile += line + '\n';
-  } else {
-    profile.replace(before, profile.find('\n', before) - before, line);
-  }
+/// What stands before and after the first `middle` in a text, or all of it and nothing.
+std::pair<std::string, std::string> splitAt(std::string_view middle, const std::string& text) {
+  const auto at = std::min(text.find(middle), text.size());
+  return {text.substr(0, at), text.substr(std::min(at + middle.size(), text.size()))};
 }
 
+/// Throws what is wrong with how a file is written: then no test of the program is listed.
 class CaseFile {
  public:
   explicit CaseFile(const std::string& path) {
     std::istringstream stream(readFile(path));
     std::string line;
     while (++number, std::getline(stream, line)) {
-      if (line.empty() || line.starts_with('#')) continue;
       try {
-        readLine(line);
+        if (!line.empty() && !line.starts_with('#')) readLine(line);
       } catch (const std::exception& fault) {
-        if (cases.empty()) cases.push_back({"none", number});
-        cases.back().faults += path + ':' + std::to_string(number) + ": " + fault.what() + '\n';
+        throw std::runtime_error(path + ':' + std::to_string(number) + ": " + fault.what());
       }
     }
   }
@@ -57,38 +50,32 @@ class CaseFile {
 
  private:
   void readLine(const std::string& line) {
-    const auto blank = std::min(line.find(' '), line.size());
-    const auto key = line.substr(0, blank);
-    const auto text = unescaped(line.substr(std::min(blank + 1, line.size())));
+    const auto& [key, escaped] = splitAt(" ", line);
+    const auto text = unescaped(escaped);
     if (line.ends_with(' ')) throw std::runtime_error("a blank at the end is to be written \\s");
     if (key == "==") return startCase(text);
     if (cases.empty()) throw std::runtime_error("no case has been started");
-    auto& start = cases.back().start;
-    if (key == "device") return setDevice(start.profile, text);
+    auto& [name, first, device, start, expected] = cases.back();
+    if (key == "device") return static_cast<void>(device[splitAt(" =", text).first] = text);
     if (key == "not") return replace(text);
     if (key == "word" || key == "words") return addWords(start.words, text, key == "word");
     if (key == "terminal") return static_cast<void>(start.onTerminal = true);
     if (key == "no-input") return start.input.reset();
     if (key == "name") return static_cast<void>(start.name = text);
-    if (key == "status") return static_cast<void>(cases.back().expected.status = std::stoi(text));
+    if (key == "status") return static_cast<void>(expected.status = std::stoi(text));
     if (key == "help") return addText("out+", unescaped(readFile(kFolder + text + ".help")));
     addText(key, text);
   }
 
   void startCase(const std::string& heading) {
-    const auto name = heading.substr(0, heading.find(" < "));
-    const auto base = heading.substr(std::min(name.size() + 3, heading.size()));
-    const auto called = [this](const std::string& wanted) {
-      return std::ranges::find(cases, wanted, &Case::name);
-    };
-    const bool isRepeated = called(name) != cases.end();
-    const bool isLost = !base.empty() && called(base) == cases.end();
-    cases.push_back(base.empty() || isLost ? Case() : Case(*called(base)));
+    const auto& [name, base] = splitAt(" < ", heading);
+    const auto above = std::ranges::find(cases, base, &Case::name);
+    if (above == cases.end() && !base.empty()) throw std::runtime_error("no such case above");
+    if (std::ranges::count(cases, name, &Case::name) > 0) throw std::runtime_error("a name again");
+    cases.push_back(base.empty() ? Case() : Case(*above));
     cases.back().name = name;
     cases.back().line = number;
     inherited = {"words", "in", "out", "err", "request"};
-    if (isRepeated) throw std::runtime_error("another case has this name");
-    if (isLost) throw std::runtime_error("no case above is called " + base);
   }
 
   void addWords(std::vector<std::string>& words, const std::string& text, bool isOne) {
@@ -113,14 +100,12 @@ class CaseFile {
 
   /// "OLD but NEW", in what is expected.
   void replace(const std::string& text) {
-    constexpr std::string_view kBut = " but ";
-    const auto middle = std::min(text.find(kBut), text.size());
+    const auto& [old, replacement] = splitAt(" but ", text);
     bool isFound = false;
     auto& expected = cases.back().expected;
     for (auto* const of : {&expected.out, &expected.err, &expected.requests}) {
-      for (auto at = of->find(text.substr(0, middle)); at != std::string::npos;
-           at = of->find(text.substr(0, middle), at + 1)) {
-        of->replace(at, middle, text.substr(std::min(middle + kBut.size(), text.size())));
+      for (auto at = of->find(old); at != std::string::npos; at = of->find(old, at + 1)) {
+        of->replace(at, old.size(), replacement);
         isFound = true;
       }
     }
@@ -138,7 +123,7 @@ class CaseTest : public testing::Test {
  private:
   void TestBody() override {
     const testing::ScopedTrace trace(path.c_str(), one.line, one.name);
-    ASSERT_EQ(one.faults, "");
+    for (const auto& [key, line] : one.device) one.start.profile += line + '\n';
     expectOutcome(run(one.start), one.expected);
   }
 
