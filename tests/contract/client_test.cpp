@@ -66,6 +66,10 @@ TEST_F(Client, LeavesTheReplyNullWhereARequestFails) {
 }
 
 TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
+  lumo::object reply;
+  const auto asked = zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty,
+                                                 propertyRequest(zub::kKeyTraceMode), &reply);
+  if (asked.code == zub::kResultServerNotRunning) GTEST_SKIP() << "there is no server";
   struct Seen {
     dispatch::group reported = dispatch::group::create();
     std::atomic<bool> open = true;
@@ -82,7 +86,7 @@ TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
       });
   zub::client::EventsOn(manager);
   EXPECT_GT(seen.use_count(), 1);  // the handler is kept
-  if (!seen->reported.wait(1s)) GTEST_SKIP() << "the server reports no state";
+  ASSERT_TRUE(seen->reported.wait(60s));
   EXPECT_EQ(seen->thread.load(), thread);
 }
 
