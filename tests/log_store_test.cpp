@@ -12,7 +12,6 @@
 #include <map>
 #include <new>
 #include <random>
-#include <stdexcept>
 #include <thread>
 
 #include "platform/host/device/Device.h"
@@ -63,7 +62,7 @@ struct Pieces final : host::ByteSource {
 };
 
 /// The messages of a log, and behind them how it ends.
-Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
+Texts readAll(std::string_view log, std::size_t piece = 1 << 20, bool saysWhere = false) {
   RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
   Texts seen;
   try {
@@ -73,7 +72,7 @@ Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
     seen.emplace_back("end");
   } catch (const host::DamagedLog& damage) {
     const std::string text = damage.what();
-    seen.push_back(text.substr(text.find(": ") + 2));
+    seen.push_back(text.substr(saysWhere ? 0 : text.find(": ") + 2));
   }
   return seen;
 }
@@ -116,23 +115,11 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
     }
     for (const std::size_t piece : {std::size_t{1}, log.size() + 1}) {
       std::string seen;
-      for (const auto& text : readAll(log, piece))
+      for (const auto& text : readAll(log, piece, true))
         seen += (text == kForged ? "FORGED" : text) + "; ";
       EXPECT_EQ(seen, row[1] + "; ");
     }
   });
-}
-
-TEST(RecordedLog, DamageSaysWhereItIs) {
-  const std::string log = kDate + "\nx";
-  RecordedLogReader reader(std::make_unique<Pieces>(log, 3));
-  ASSERT_EQ(reader.next(), EntryReader::Result::entry);
-  try {
-    reader.next();
-    FAIL();
-  } catch (const host::DamagedLog& damage) {
-    EXPECT_STREQ(damage.what(), "damaged at byte 39: not a field name");
-  }
 }
 
 TEST(RecordedLog, CutOffAnywhereLosesTheLastEntryAlone) {
@@ -268,17 +255,12 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
             "__REALTIME_TIMESTAMP=3000000\n_COMM=a\nMESSAGE=3\n\n__REALTIME_TIMESTAMP=2000000\n"
             "_COMM=a\n\n__REALTIME_TIMESTAMP=2000001\n_COMM=b\n_EXE=/A/É\nMESSAGE=2\n\n"
             "__REALTIME_TIMESTAMP=4000000\n_COMM=ab\n\n");
-  auto wanted = stream(log);
+  const auto wanted = stream(log);
   wanted->setFilterPredicate(
       {{{"process == %@", "a"}, {"senderImagePath CONTAINS[cd] %@", "a/e"}}});
   Delivered delivered = run(wanted, 0, OSLogDate(2'000'001));
   EXPECT_EQ(delivered.events, (Texts{"1024 0 0 0|a|a|||3@0", "1024 0 0 0|b|É|||2@0"}));
   EXPECT_EQ(delivered.reason, kOSLogEventStreamEndOfLog);
-  EXPECT_EQ(run(OSLogEventStream::initWithSource(prepared)).events.size(), 4) << "once more";
-  wanted = stream(log);
-  wanted->setFilterPredicate({});
-  EXPECT_EQ(run(wanted).events.size(), 0) << "no term is true";
-  EXPECT_THROW(stream(log)->setFilterPredicate({{{"pid == %@", "1"}}}), std::invalid_argument);
 
   host::device().logEnd = 9;
   EXPECT_EQ(run(stream(log)).reason, 9);
@@ -288,9 +270,6 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   EXPECT_EQ(delivered.events.size(), 4);
   EXPECT_EQ(delivered.reason, host::kStreamInvalidated);
   EXPECT_EQ(run(stream(log), 2).events.size(), 2);
-  const auto stopped = stream(log);
-  stopped->invalidate();
-  EXPECT_EQ(run(stopped).events.size(), 0);
 }
 
 TEST_F(LogStore, ReadsOnWhileAnEventIsHandledUntilItIsInvalidated) {
