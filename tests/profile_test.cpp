@@ -3,7 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
-#include <map>
 #include <sstream>
 
 #include "tests/Program.h"
@@ -60,28 +59,24 @@ TEST(Profile, ThoseThatShipAreGood) {
   }
 }
 
-/// The settings in those lines of a file that start with `prefix`, without their comments.
-std::map<std::string, std::string> settingsIn(const std::string& file, const std::string& prefix,
-                                              const std::string& equals) {
-  std::map<std::string, std::string> found;
-  std::istringstream stream(readFile(ZUBTOOL_SOURCES + file));
-  for (std::string line; std::getline(stream, line);) {
+TEST(Profile, ItsManualAndItsExampleShowEachKey) {
+  const auto manual = readFile(ZUBTOOL_SOURCES "/docs/zub-device.5");
+  std::istringstream example(readFile(ZUBTOOL_SOURCES "/devices/phone.device"));
+  std::size_t settings = 1;  // and request-log, which has no default
+  for (std::string line; std::getline(example, line);) {
     line = line.substr(0, line.find('#'));
     line.resize(line.find_last_not_of(' ') + 1);
-    if (line.empty() || !line.starts_with(prefix)) continue;
-    const auto middle = std::min(line.find(equals), line.size());
-    found[line.substr(prefix.size(), middle - prefix.size())] =
-        line.substr(std::min(middle + equals.size(), line.size()));
+    if (line.empty()) continue;
+    ++settings;
+    const auto item = "\n.It Ic " + line.replace(line.find(" ="), 2, " No =") + '\n';
+    EXPECT_NE(manual.find(item), std::string::npos) << item;
   }
-  return found;
-}
-
-TEST(Profile, ItsManualAndItsExampleShowEachKey) {
-  auto manual = settingsIn("/docs/zub-device.5", ".It Ic ", " No = ");
-  for (const auto key : host::profileKeys()) EXPECT_TRUE(manual.contains(std::string(key))) << key;
-  EXPECT_EQ(manual.size(), host::profileKeys().size());
-  manual.erase("request-log");  // has no default
-  EXPECT_EQ(manual, settingsIn("/devices/phone.device", "", " = "));
+  EXPECT_EQ(settings, host::profileKeys().size());
+  EXPECT_NE(manual.find("\n.It Ic request-log\n"), std::string::npos);
+  for (auto at = manual.find("\n.It Ic "); at != std::string::npos; --settings) {
+    at = manual.find("\n.It Ic ", at + 1);
+  }
+  EXPECT_EQ(settings, 0) << "the manual has other keys as well";
 }
 
 }  // namespace
