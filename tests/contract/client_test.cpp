@@ -15,7 +15,10 @@ namespace {
 
 class Client : public testing::Test {
  protected:
-  Client() {
+  Client() { settle(); }
+
+  /// Waits until the queue has run what it was given.
+  void settle() {
     const auto asked = dispatch::group::create();
     queue.async(
         [this, member = dispatch::membership(asked)] { thread = std::this_thread::get_id(); });
@@ -78,12 +81,15 @@ TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
   const auto seen = std::make_shared<Seen>();
   seen->reported.enter();
   zub::client::EventsOff(manager);
+  settle();
   zub::client::RegisterEventHandler(
       manager, zub::kEventServerStateChange, [seen](const lumo::object& payload, const auto&) {
         EXPECT_TRUE(!payload.isDict() || payload.get(zub::kKeyServerState).as<std::string>());
         seen->thread = std::this_thread::get_id();
         if (seen->open.exchange(false)) seen->reported.leave();
       });
+  settle();
+  EXPECT_TRUE(seen->open) << "events are off";
   zub::client::EventsOn(manager);
   EXPECT_GT(seen.use_count(), 1);  // the handler is kept
   ASSERT_TRUE(seen->reported.wait(60s));
