@@ -79,7 +79,11 @@ telephony logs with a core dump of the modem, or baseband traces, and
 prints where they are. It also exports the recent system log of chosen
 processes into a text file.
 .
-On an ordinary Linux machine it runs on a device that a small text file
-describes.")
+On an ordinary Linux machine there is no such device. The tool then plays
+one: it says Success and a path that does not exist, and exports invented
+lines. A device profile, named by the environment variable ZUB_DEVICE,
+makes the export real: /usr/share/zubtool/devices/host.device for the
+journal of this machine, or a file with the line 'log = FILE' for a log
+from elsewhere.")
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 include(CPack)
