@@ -18,7 +18,9 @@
 namespace {
 
 TEST(Processes, RunUntilTheyEndAndNotUntilTheyAreReaped) {
+  EXPECT_FALSE(tlu::isProcessRunning("zub_tests"));
   host::device().hostProcesses = true;
+  EXPECT_TRUE(tlu::isProcessRunning("zub_tests"));
   const auto name = "x) Z (y";
   const pid_t process = fork();
   if (process == 0) {

@@ -35,13 +35,6 @@ TEST(TraceNames, FollowTheVendorButTheCoreDumpSuffixOnlyOnce) {
   EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-qdss");
 }
 
-TEST(Telephony, ProcessesOfThisMachineRunIfTheDeviceSaysSo) {
-  EXPECT_FALSE(tlu::isProcessRunning("zub_tests"));
-  host::device().hostProcesses = true;
-  EXPECT_TRUE(tlu::isProcessRunning("zub_tests"));
-  EXPECT_FALSE(tlu::isProcessRunning("zub_test"));
-}
-
 TEST(Answers, HaveTheTimeOfDay) {
   const auto before = std::time(nullptr);
   std::tm local{};
