@@ -389,7 +389,7 @@ class Journal : public LogStore {
   }
 
   std::string makeFile(const std::string& name, const std::string& log) {
-    const std::string file = folder + "/" + name + ".journal";
+    std::string file = folder + "/" + name + ".journal";
     const std::string make =
         std::string(kWriter) + " -o " + file + " " + write("log", log) + " >/dev/null 2>&1";
     EXPECT_EQ(system(make.c_str()), 0);
