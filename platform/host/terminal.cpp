@@ -41,6 +41,9 @@ constexpr struct {
     {L"\\e[1;5D", L"ed-prev-word"},  {L"\\e[1~", L"ed-move-to-beg"},
     {L"\\e[7~", L"ed-move-to-beg"},  {L"\\e[4~", L"ed-move-to-end"},
     {L"\\e[8~", L"ed-move-to-end"},  {L"\\e[3~", L"ed-delete-next-char"},
+    {L"\\e[2~", L"ed-unassigned"},   {L"\\e[5~", L"ed-unassigned"},
+    {L"\\e[6~", L"ed-unassigned"},   {L"\\ex", L"ed-unassigned"},
+    {L"\\eX", L"ed-unassigned"},
 };
 
 /// Gives the calling thread the character types of UTF-8 while this lives. What is printable and

@@ -1,6 +1,7 @@
 #include "platform/host/log/JournalReader.h"
 
 #include <fcntl.h>
+#include <sys/stat.h>
 #include <systemd/sd-journal.h>
 
 #include <algorithm>
@@ -93,6 +94,8 @@ struct NamedValue {
 /// Of a compressed value, as much as is uncompressed at first: unwanted ones may be huge.
 constexpr std::size_t kFirstPart = std::size_t{64} << 10;
 
+constexpr std::uint64_t kBlockSize = 512;  // of st_blocks, see stat(3type)
+
 /// What is uncompressed of a wanted one: enough to see that it is too long.
 constexpr std::size_t kWantedPart = kMaxField + 1024;
 
@@ -136,10 +139,21 @@ class JournalReader final : public EntryReader {
     }
   }
 
-  /// Each file still has what its header says. What has been cut off or dropped since it was
-  /// opened, the library may have passed over.
+  /// Each file still has what its header says, and the library still has each file: it drops one
+  /// that it cannot read or map any more, and goes on with the others.
   void checkFiles() const {
-    for (const JournalFile& file : files) checkJournalFile(file);
+    std::uint64_t present = 0;
+    for (const JournalFile& file : files) {
+      checkJournalFile(file);
+      struct stat about = {};
+      ::fstat(file.descriptor.get(), &about);
+      present += static_cast<std::uint64_t>(about.st_blocks) * kBlockSize;
+    }
+    std::uint64_t used = 0;
+    if (::sd_journal_get_usage(journal.get(), &used) < 0 || used < present) {
+      throw std::runtime_error(std::string(kCannotRead) +
+                               "files were dropped, for too little memory?");
+    }
   }
 
   /// False when the entry has no date that an event can have.
