@@ -53,6 +53,8 @@ TEST(Terminal, EditsLinesAndRunsWhatTheyBecome) {
       {kTel + "ac\033[Db\r", 1, requestOf("abc")},                   // left
       {"tel x\033[Hlogdump \r", 1, requestOf("x")},                  // to the start
       {"lo\tt\tq\r", 1, requestOf("q")},                             // sub-command and handler
+      {"logdump \ttel d\r", 2, requestOf("d")},                      // a list, and the prompt again
+      {kTel + "ef\033[D\004\r", 1, requestOf("e")},                  // a character taken away
       {kTel + "nonui\027w\r", 1, requestOf("w")},                    // a word taken back
       {kTel + "1\r\033[A2\r", 2, requestOf("1") + requestOf("12")},  // the line before
       {kTel + "1\rhelp\r\022tel\033[F2\r", 3, requestOf("1") + requestOf("12")},  // a search
@@ -76,6 +78,7 @@ TEST(Terminal, IsAsItWasHoweverTheProgramEnds) {
     auto program = start("xterm-256color");
     if (takesLines(program)) GTEST_SKIP() << "no line editing in this build";
     const int terminal = dup(program.terminal());
+    for (const int waking : {SIGWINCH, SIGCONT}) kill(program.pid(), waking);
     signal == 0 ? program.type("quit\r") : static_cast<void>(kill(program.pid(), signal));
     EXPECT_EQ(program.finish().status, signal == 0 ? 0 : 1000 + signal);
     termios after{};
