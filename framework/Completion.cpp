@@ -20,6 +20,12 @@ struct Usage {
   Offer options;
 };
 
+/// What ends a piece of a help text that starts with `opening`.
+char Closing(char opening) {
+  if (opening == '[') return ']';
+  return opening == '<' ? '>' : ' ';
+}
+
 /// Reads the brackets, angles and dashes in front of the description.
 Usage ReadUsage(const std::string& help) {
   Usage usage;
@@ -27,11 +33,7 @@ Usage ReadUsage(const std::string& help) {
        at = help.find_first_not_of(' ', at)) {
     const char kind = help[at];
     if (kind != '[' && kind != '<' && kind != '-') break;
-    const auto end = std::min(help.find(kind == '['   ? ']'
-                                        : kind == '<' ? '>'
-                                                      : ' ',
-                                        at),
-                              help.size());
+    const auto end = std::min(help.find(Closing(kind), at), help.size());
     const auto text = help.substr(at + 1, end - at - 1);
     if (kind == '-') {
       usage.options.insert('-' + text);
@@ -86,7 +88,7 @@ bool EqualsIgnoringCase(const std::string& one, const std::string& other) {
   return std::ranges::equal(one, other, {}, lower, lower);
 }
 
-/// Behind a handler and its `words`. A first word that is no option ends the options, unless those
+/// After a handler and its `words`. A first word that is no option ends the options, unless those
 /// with a dash in front take words of their own.
 Offer Options(Usage usage, Words words, const std::string& start) {
   for (const auto& place : usage.places) {
