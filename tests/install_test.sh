@@ -16,18 +16,15 @@ fail() {
 }
 
 # The files of an installation, with their modes.
-expected() {
-  local share=usr/share file
-  printf '%s\n' '755 usr/bin/zubtool' "644 $share/man/man1/zubtool.1.gz" \
-    "644 $share/man/man5/zub-device.5.gz" "644 $share/doc/zubtool/changelog.gz" \
-    "644 $share/doc/zubtool/copyright" "644 $share/bash-completion/completions/zubtool" \
-    "644 $share/zsh/vendor-completions/_zubtool" \
-    "644 $share/fish/vendor_completions.d/zubtool.fish"
-  for file in "$sources"/devices/*; do echo "644 $share/zubtool/devices/${file##*/}"; done
-}
+expected=$(
+  echo '755 usr/bin/zubtool'
+  printf '644 usr/share/%s\n' man/man{1/zubtool.1,5/zub-device.5}.gz doc/zubtool/{changelog.gz,copyright} \
+    bash-completion/completions/zubtool zsh/vendor-completions/_zubtool fish/vendor_completions.d/zubtool.fish
+  cd "$sources" && printf '644 usr/share/zubtool/%s\n' devices/*
+)
 
 check_files() {  # ROOT
-  diff <(expected | sort -k 2) <(cd "$1" && find usr -type f -printf '%m %p\n' | sort -k 2) >&2 ||
+  diff <(sort -k 2 <<<"$expected") <(cd "$1" && find usr -type f -printf '%m %p\n' | sort -k 2) >&2 ||
     fail "$1 does not hold the files it should (<), but others (>)"
   ! find "$1/usr" -type d ! -perm 755 -printf '%m %p\n' | grep . >&2 || fail "$1 has such folders"
   for page in "$1"/usr/share/man/*/*.gz; do
@@ -40,8 +37,6 @@ check_files() {  # ROOT
 check_program() {  # ROOT
   local program=$1/usr/bin/zubtool status=0 message
   ! grep -aqF -e "$build" -e "$sources" "$program" || fail "$program names the build's folders"
-  env -i "$program" help >out || fail "'zubtool help' ends with status $?"
-  grep -q logdump out || fail "'zubtool help' prints: $(cat out)"
   message=$(env -i ZUB_DEVICE="$1/usr/share/zubtool/devices/server-down.device" \
     "$program" logdump tel 2>&1) || status=$?
   [[ $status == 1 && $message == "Server is not running."* ]] ||
