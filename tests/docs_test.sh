@@ -4,8 +4,8 @@
 set -eEuo pipefail
 export LC_ALL=C ZUB_DEVICE=
 
-program=$1
-sources=$(cd "$(dirname "$0")/.." && pwd)
+program=$(realpath "$1")
+cd "$(dirname "$0")/../completions"
 failed=0
 trap 'echo "docs_test: line $LINENO fails" >&2' ERR
 
@@ -40,11 +40,27 @@ read_tree() {
   done
 }
 
+# Prints what the completion for a shell offers behind words, one a line.
+offers_of_bash() (
+  compopt() { :; }
+  source ./zubtool.bash
+  COMP_WORDS=("$@" '') COMP_CWORD=$#
+  _zubtool
+  printf '%s\n' "${COMPREPLY[@]}"
+)
+offers_of_zsh() {
+  zsh -fc '_describe() { print -rl -- "${(@)offered%%:*}" }
+    _files() { : }
+    words=("$@" "") CURRENT=$#words
+    source ./_zubtool' zsh "$@"
+}
+offers_of_fish() {
+  HOME=/dev/null fish --no-config -c 'source ./zubtool.fish
+    complete -C "$argv " | string replace -r "\t.*" ""; true' -- "$@"
+}
+
 check_offer() {  # SHELL LINE EXPECTED
-  local typed actual
-  read -ra typed <<<"$2"
-  actual=$("$sources/tests/completions.sh" "$1" "${typed[@]:1}")
-  check_same "$1 should offer other words (<) after '$2' than it does (>)" "$3" "$actual"
+  check_same "$1 should offer other words (<) after '$2' than it does (>)" "$3" "$("offers_of_$1" $2)"
 }
 
 check_completion() {  # SHELL
@@ -56,8 +72,7 @@ check_completion() {  # SHELL
     if [[ $path == *' '*' '* ]]; then words+=$'\n--'; fi
     check_offer "$1" "$line" "$words"
   done
-  check_offer "$1" 'zubtool logdump bb NONUI Tar tar.gz nocompress' \
-    "${tree[zubtool logdump bb]-}"$'\n--'
+  check_offer "$1" 'zubtool logdump bb NONUI Tar tar.gz nocompress' "${tree[zubtool logdump bb]-}"$'\n--'
   check_offer "$1" 'zubtool logdump tel why' '--'
   check_offer "$1" 'zubtool logdump oslog 600 out.txt -p a -i' ''
   check_offer "$1" 'zubtool logdump tel -- cd' "${tree[zubtool cd]}"
@@ -71,6 +86,6 @@ for shell in bash zsh fish; do
     echo "not run: the completion for $shell: it is not installed"
   fi
 done
-named=$(find_all '\b(Ic|Cm) \K\S+|\bFl \K[a-z]' <"$sources/docs/zubtool.1" | sed 's/^.$/-&/')
+named=$(find_all '\b(Ic|Cm) \K\S+|\bFl \K[a-z]' <../docs/zubtool.1 | sed 's/^.$/-&/')
 check_same 'zubtool(1) should name other words (<) than it does (>)' "$(printf '%s\n' "${tree[@]}")" "$named"
 exit "$failed"
