@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Compares completions and the manual page with the words that the program itself takes.
+# Compares completions and manual pages with the words that the program itself takes.
 # usage: tests/docs_test.sh PROGRAM   (the path of zubtool)
 set -eEuo pipefail
 export LC_ALL=C ZUB_DEVICE=
@@ -42,6 +42,7 @@ read_tree() {
 
 # Prints what the completion for a shell offers behind words, one a line.
 offers_of_bash() (
+  trap - ERR  # to offer nothing is no fault
   compopt() { :; }
   source ./zubtool.bash
   COMP_WORDS=("$@" '') COMP_CWORD=$#
@@ -88,4 +89,10 @@ for shell in bash zsh fish; do
 done
 named=$(find_all '\b(Ic|Cm) \K\S+|\bFl \K[a-z]' <../docs/zubtool.1 | sed 's/^.$/-&/')
 check_same 'zubtool(1) should name other words (<) than it does (>)' "$(printf '%s\n' "${tree[@]}")" "$named"
+
+keys=$(sed -nE 's/^    \{"([a-z-]+)", .*/\1/p' ../platform/host/device/Profile.cpp)
+items=$(sed -n 's/^\.It Ic //p' ../docs/zub-device.5)
+check_same 'zub-device(5) should show other keys (<) than it does (>)' "$keys" "$(sed 's/ No.*//' <<<"$items")"
+check_same 'its defaults should be those (<) of phone.device' \
+  "$(sed 's/ *#.*//; s/ = / No = /' ../devices/phone.device)"$'\nrequest-log' "$items"
 exit "$failed"

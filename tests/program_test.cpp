@@ -1,15 +1,11 @@
 // The real program where a case of tests/cases cannot say what is to be seen.
 
-#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sys/resource.h>
-#include <unistd.h>
 
 #include <algorithm>
-#include <filesystem>
 #include <sstream>
 
-#include "platform/system.h"
 #include "tests/Program.h"
 
 namespace {
@@ -64,16 +60,6 @@ TEST(Program, ExportsTheLogOfARealMachine) {
   writeFile(own, readFile(data + "export"));
   expectOutcome(run({{"logdump", "oslog", "600", own}, "log = " + own}), {.status = 1});
   EXPECT_EQ(readFile(own), readFile(data + "export")) << "the log is no place to export it to";
-}
-
-TEST(Program, HasStandardStreamsThatWereClosed) {
-  const auto open = [] {
-    close(STDIN_FILENO);
-    close(STDERR_FILENO);
-    platform::openStandardStreams();
-    _exit(fcntl(STDIN_FILENO, F_GETFD) + fcntl(STDERR_FILENO, F_GETFD));
-  };
-  EXPECT_EXIT(open(), testing::ExitedWithCode(0), "");
 }
 
 TEST(Program, EndsWhenTheShellThreadCannotStart) {
