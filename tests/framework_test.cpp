@@ -17,15 +17,12 @@ namespace {
 using Words = std::list<std::string>;
 
 /// What the program reads on standard input while this lives.
-class TypedInput : public std::stringbuf {
- public:
+struct TypedInput : std::stringbuf {
   explicit TypedInput(const std::string& text)
       : std::stringbuf(text), before(std::cin.rdbuf(this)) {
     std::cin.clear();
   }
   ~TypedInput() override { std::cin.rdbuf(before); }
-
- private:
   std::streambuf* before;
 };
 

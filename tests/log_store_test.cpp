@@ -12,20 +12,18 @@
 #include <map>
 #include <new>
 #include <random>
-#include <thread>
 
 #include "platform/host/device/Device.h"
-#include "platform/host/log/EventFilter.h"
 #include "platform/host/log/FoldedText.h"
 #include "platform/host/log/LogEvent.h"
 #include "platform/host/log/RecordedLogReader.h"
 #include "platform/host/log/StreamEnd.h"
-#include "platform/oslog_store.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
 #include "platform/posix/files.h"
 #include "platform/system.h"
 #include "tests/Program.h"
+#include "tests/StreamRun.h"
 #include "tests/Table.h"
 
 using namespace std::chrono_literals;
@@ -204,18 +202,10 @@ class LogStore : public testing::Test {
   static Delivered run(const std::shared_ptr<OSLogEventStream>& from, OSLogDate date,
                        OnEvent onEvent) {
     Delivered delivered;
-    const auto ended = dispatch::group::create();
-    from->setEventHandler([&](const OSLogEventProxy& event) {
+    delivered.reason = runToItsEnd(*from, date, [&](const OSLogEventProxy& event) {
       delivered.events.push_back(summary(event));
       onEvent(delivered.events.size());
     });
-    from->setInvalidationHandler(
-        [&delivered, member = dispatch::membership(ended)](unsigned long reason, const auto&) {
-          EXPECT_EQ(std::exchange(delivered.reason, reason), 0);
-        });
-    from->activateStreamFromDate(date);
-    from->setInvalidationHandler(nullptr);
-    EXPECT_TRUE(ended.wait(60s));
     return delivered;
   }
 
@@ -285,19 +275,13 @@ TEST_F(LogStore, HoldsTextsOfAnySizeAsLongAsTheyAreInHand) {
   for (std::size_t i = 0; i < 40; ++i) text += kDate + "MESSAGE=" + textOf(i) + "\n\n";
   const std::string log = write("log", std::exchange(text, {}));
   const auto inUse = [] { return mallinfo2().uordblks + mallinfo2().hblkhd; };
-  const auto sized = stream(log);
   std::size_t seen = 0;
   std::size_t held = 0;
-  const auto ended = dispatch::group::create();
   const auto before = inUse();
-  sized->setEventHandler([&](const OSLogEventProxy& event) {
+  runToItsEnd(*stream(log), OSLogDate(0), [&](const OSLogEventProxy& event) {
     EXPECT_TRUE(event.composedMessage() == textOf(seen)) << seen;
     if (++seen == 40) held = inUse() - before;
   });
-  sized->setInvalidationHandler([member = dispatch::membership(ended)](auto, const auto&) {});
-  sized->activateStreamFromDate(OSLogDate(0));
-  sized->setInvalidationHandler(nullptr);
-  EXPECT_TRUE(ended.wait(60s));
   EXPECT_EQ(seen, 40U);
   EXPECT_LT(held, kHuge / 2);
   EXPECT_EQ(run(stream(log), 1).reason, host::kStreamInvalidated) << "while it reads ahead";

@@ -1,14 +1,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <atomic>
+#include <cmath>
+#include <cstdlib>
 #include <functional>
+#include <limits>
 #include <stdexcept>
 #include <thread>
 
-#include "platform/oslog_store.h"
-
-using namespace std::chrono_literals;
+#include "tests/StreamRun.h"
+#include "tests/Table.h"
 
 namespace {
 
@@ -39,39 +40,23 @@ class LogStore : public testing::Test {
   /// what a log of any length has enough of.
   std::vector<Event> run(OSLogDate from, const std::function<void()>& each = nullptr) {
     std::vector<Event> events;
-    const auto ended = dispatch::group::create();
-    auto owned = std::make_shared<int>(0);
-    const std::weak_ptr<int> handler(owned);
-    stream->setEventHandler([&, owned = std::move(owned)](const OSLogEventProxy& event) {
+    runToItsEnd(*stream, from, [&](const OSLogEventProxy& event) {
       EXPECT_GE(event.date(), from);
       if (each) each();
       if (events.size() == kMost) return stream->invalidate();
       events.push_back(
           {event.date(), std::string(event.process()), std::string(event.composedMessage())});
     });
-    stream->setInvalidationHandler(
-        [&, member = dispatch::membership(ended)](unsigned long, const auto&) {
-          ++ends;
-          EXPECT_TRUE(handler.expired()) << "the event handler is released before the end";
-        });
-    stream->activateStreamFromDate(from);
-    stream->setInvalidationHandler(nullptr);
-    EXPECT_TRUE(ended.wait(60s));
-    EXPECT_EQ(ends, 1);
     return events;
   }
 
-  void renew() {
-    stream = OSLogEventStream::initWithSource(source);
-    ends = 0;
-  }
+  void renew() { stream = OSLogEventStream::initWithSource(source); }
 
   static constexpr std::size_t kMost = 1000;
   const OSLogDate tenMinutesAgo = OSLogDate::now().addingSeconds(-600);
   std::string error;
   std::shared_ptr<OSLogEventSource> source;
   std::shared_ptr<OSLogEventStream> stream;
-  std::atomic<int> ends = 0;
 };
 
 TEST_F(LogStore, DeliversTheEventsInTheirOrderFromTheDateOn) {
@@ -103,11 +88,8 @@ TEST_F(LogStore, DeliversWhatAnyTermOfTheFilterLetsPass) {
 }
 
 TEST_F(LogStore, IsInvalidatedFromAnywhere) {
-  run(tenMinutesAgo, [this] {
-    stream->invalidate();  // from its own thread, again and again
-    EXPECT_EQ(ends, 0);
-  });
-  stream->invalidate();  // after its end
+  run(tenMinutesAgo, [this] { stream->invalidate(); });  // from its own thread, again and again
+  stream->invalidate();                                  // after its end
   renew();
   stream->invalidate();
   EXPECT_TRUE(run(tenMinutesAgo).empty()) << "invalidated before it was activated";
@@ -122,7 +104,35 @@ TEST_F(LogStore, RunsToItsEndWhenItsMakerReleasesIt) {
   stream->setInvalidationHandler([member = dispatch::membership(ended)](auto, const auto&) {});
   stream->activateStreamFromDate(tenMinutesAgo);
   stream.reset();
-  EXPECT_TRUE(ended.wait(60s));
+  EXPECT_TRUE(ended.wait(std::chrono::seconds(60)));
+}
+
+TEST(Dates, HaveTheirDefaultForm) {
+  using Limits = std::numeric_limits<std::int64_t>;
+  forEachRow("dates", 2, [](const Row& row) {
+    std::string text;
+    OSLogDate(std::stoll(row[0])).appendDescription(text);
+    EXPECT_EQ(text, row[1]);
+  });
+  const OSLogDate date(5);
+  EXPECT_EQ(date.addingSeconds(-0.29), OSLogDate(5 - 290'000));
+  EXPECT_EQ(date.addingSeconds(std::nan("")), date);
+  EXPECT_EQ(date.addingSeconds(INFINITY), OSLogDate(Limits::max()));
+  EXPECT_EQ(date.addingSeconds(0x1p63 / 1e6), OSLogDate(Limits::max()));
+  EXPECT_EQ(OSLogDate(Limits::min()).addingSeconds(-1), OSLogDate(Limits::min()));
+}
+
+TEST(Dates, AreInALocalZoneWithItsSummerTime) {
+  setenv("TZ", "CET-1CEST,M3.5.0/2:30:20,M10.5.0/3", 1);
+  tzset();
+  std::thread([] {  // one that has not asked before
+    const OSLogTimeZone local;
+    EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'848'619'999'999)), 3'600);
+    EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'848'620'000'000)), 7'200);
+  })
+      .join();
+  unsetenv("TZ");
+  tzset();
 }
 
 }  // namespace
