@@ -60,7 +60,6 @@ class CaseFile {
     if (key == "not") return replace(text);
     if (key == "word" || key == "words") return addWords(start.words, text, key == "word");
     if (key == "terminal") return static_cast<void>(start.onTerminal = true);
-    if (key == "no-input") return start.input.reset();
     if (key == "name") return static_cast<void>(start.name = text);
     if (key == "status") return static_cast<void>(expected.status = std::stoi(text));
     if (key == "help") return addText("out+", unescaped(readFile(kFolder + text + ".help")));

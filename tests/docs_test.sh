@@ -10,9 +10,7 @@ failed=0
 trap 'echo "docs_test: line $LINENO fails" >&2' ERR
 
 # Prints what the pattern finds in standard input, one a line; nothing is no failure.
-find_all() {  # PATTERN
-  grep -oP -- "$1" || [[ $? == 1 ]]
-}
+find_all() { grep -oP -- "$1" || [[ $? == 1 ]]; }  # PATTERN
 
 check_same() {  # WHAT EXPECTED ACTUAL: two sets of lines
   diff <(sort -u <<<"$2" | sed '/^$/d') <(sort -u <<<"$3" | sed '/^$/d') >&2 && return
@@ -81,11 +79,8 @@ check_completion() {  # SHELL
 
 read_tree
 for shell in bash zsh fish; do
-  if command -v "$shell" >/dev/null; then
-    check_completion "$shell"
-  else
-    echo "not run: the completion for $shell: it is not installed"
-  fi
+  command -v "$shell" >/dev/null || { echo "not run: the completion for $shell: it is not installed"; continue; }
+  check_completion "$shell"
 done
 named=$(find_all '\b(Ic|Cm) \K\S+|\bFl \K[a-z]' <../docs/zubtool.1 | sed 's/^.$/-&/')
 check_same 'zubtool(1) should name other words (<) than it does (>)' "$(printf '%s\n' "${tree[@]}")" "$named"

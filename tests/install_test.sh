@@ -10,10 +10,7 @@ trap 'rm -rf "$scratch"' EXIT
 cd "$scratch"
 umask 022
 
-fail() {
-  echo "install_test: $*" >&2
-  exit 1
-}
+fail() { echo "install_test: $*" >&2; exit 1; }
 
 # The files of an installation, with their modes.
 expected=$(
