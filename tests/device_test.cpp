@@ -9,6 +9,7 @@
 
 #include <csignal>
 #include <filesystem>
+#include <sstream>
 
 #include "platform/host/device/Device.h"
 #include "platform/host/device/RequestLog.h"
@@ -29,14 +30,14 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
   Profile profile;
   const auto wrong = parse(
       "\xEF\xBB\xBF# a byte order mark and a comment, then a blank line\r\n\n"
-      "radio=0x10 # another\n product = Watch3Large\nradio-vendor = -2\r\n"
+      "radio=0x10 # another\n product = 2147483647\nradio-vendor = -2\r\n"
       "processes = modemd\t @host  x\nserver = 0 Started, 250 Shutting down ,250 Off\n"
       "system-logs-mode =\nbaseband-enabled = !0xE020E001\ndump = !-1\ndump-timestamp =\n"
       "dump-delay = 4294967295\nhelper-timestamp = a = b\nlog = logs/x\nlog-end = never",
       profile);
   EXPECT_EQ(wrong.value_or("good"), "good");
   EXPECT_EQ(profile.radio, 16);
-  EXPECT_EQ(profile.product, static_cast<int>(TelephonyProduct::Watch3Large));
+  EXPECT_EQ(profile.product, 2147483647);
   EXPECT_EQ(profile.radioVendor, -2);
   EXPECT_EQ(profile.processes, (std::vector<std::string>{"modemd", "x"}));
   EXPECT_TRUE(profile.hostProcesses);
@@ -51,6 +52,19 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
   EXPECT_EQ(profile.helperTimestamp, "a = b");
   EXPECT_EQ(profile.log, "dir/logs/x");
   EXPECT_EQ(profile.logEnd, std::nullopt);
+}
+
+TEST(Profile, KnowsProductsByName) {
+  std::istringstream products(
+      "Unknown 0 Phone 1 PhoneLarge 2 Tablet 16 TabletLarge 17 Watch1Small 32 Watch1Large 33 "
+      "Watch2Small 34 Watch2Large 35 Watch3Small 36 Watch3Large 37 Watch4Small 38 Watch4Large 39 "
+      "Watch5Small 40 Watch5Large 41 Watch6Small 42 Watch6Large 43 Watch7Small 44 Watch7Large 45");
+  Profile profile;
+  int code = 0;
+  for (std::string name; products >> name >> code;) {
+    EXPECT_EQ(parse("product = " + name, profile).value_or("good"), "good");
+    EXPECT_EQ(profile.product, code) << name;
+  }
 }
 
 TEST(Profile, RefusesWhatItDoesNotUnderstand) {
@@ -106,16 +120,16 @@ TEST(Server, FailsADumpForWhichThereIsNoThread) {
   const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
   const auto group = dispatch::group::create();
   std::int32_t code = 0;
-  zub::client::Completion completion = [&code, member = dispatch::membership(group)](
-                                           const TelephonyLumo::Result& result,
-                                           const lumo::object&) { code = result.code; };
   pthread_attr_t before{};
   pthread_getattr_default_np(&before);
   pthread_attr_t huge{};
   pthread_attr_init(&huge);
   pthread_attr_setstacksize(&huge, std::size_t{1} << 46);
   ASSERT_EQ(pthread_setattr_default_np(&huge), 0);
-  zub::client::PerformCommand(manager, zub::kCommandTraceDumpState, std::move(completion), {});
+  zub::client::PerformCommand(manager, zub::kCommandTraceDumpState,
+                              [&code, member = dispatch::membership(group)](
+                                  const auto& result, const auto&) { code = result.code; },
+                              {});
   pthread_setattr_default_np(&before);
   EXPECT_TRUE(group.wait(std::chrono::seconds(60)));
   EXPECT_NE(code, 0);
