@@ -16,8 +16,9 @@ class StopSignal {
   void raise() noexcept;
   bool raised() const noexcept { return isRaised.load(std::memory_order_relaxed); }
 
-  /// Blocks until `descriptor` has something to read, or has ended or failed; false when the
-  /// signal is raised, before that or with it. -1 is a descriptor of which nothing ever comes.
+  /// Blocks until `descriptor` has something to read, or has ended or failed, or a signal of the
+  /// system comes; false when this signal is raised, before that or with it. -1 is a descriptor of
+  /// which nothing ever comes.
   bool waitReadable(int descriptor) const;
 
  private:
