@@ -7,15 +7,12 @@
 #include <array>
 #include <cerrno>
 #include <cstdint>
-#include <mutex>
 
 namespace host {
 namespace {
 
 // What the handler reads is set before it is installed. It may be called on any thread.
 constinit thread_local JournalFaults* ofThisThread = nullptr;
-std::mutex mutex;  ///< of `users`
-int users = 0;
 struct sigaction before = {};
 
 /// Reads /proc/self/maps (see proc(5)) byte by byte, with nothing but system calls.
@@ -83,44 +80,29 @@ bool putEmptyPage(void* address) {
   return ::mmap(page, size, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) == page;
 }
 
-void passOn(int signal, siginfo_t* info, void* context) {
-  if ((before.sa_flags & SA_SIGINFO) != 0) {
-    before.sa_sigaction(signal, info, context);
-  } else if (before.sa_handler != SIG_DFL && before.sa_handler != SIG_IGN) {
-    before.sa_handler(signal);
-  } else {
-    ::sigaction(signal, &before, nullptr);
-    ::raise(signal);  // blocked until the handler returns
-  }
-}
-
 }  // namespace
 
 JournalFaults::JournalFaults() : outer(ofThisThread) {
   ofThisThread = this;
-  const std::lock_guard lock(mutex);
-  if (users++ > 0) return;
-  struct sigaction ours = {};
-  ours.sa_sigaction = handle;
-  ours.sa_flags = SA_SIGINFO | SA_ONSTACK;
-  sigfillset(&ours.sa_mask);
-  ::sigaction(SIGBUS, nullptr, &before);
-  ::sigaction(SIGBUS, &ours, nullptr);
+  [[maybe_unused]] static const bool kIsInstalled = [] {
+    struct sigaction ours = {};
+    ours.sa_sigaction = handle;
+    ours.sa_flags = SA_SIGINFO;
+    ::sigaction(SIGBUS, nullptr, &before);
+    return ::sigaction(SIGBUS, &ours, nullptr) == 0;
+  }();
 }
 
-JournalFaults::~JournalFaults() {
-  ofThisThread = outer;
-  const std::lock_guard lock(mutex);
-  if (--users == 0) ::sigaction(SIGBUS, &before, nullptr);
-}
+JournalFaults::~JournalFaults() { ofThisThread = outer; }
 
-void JournalFaults::handle(int signal, siginfo_t* info, void* context) {
+void JournalFaults::handle(int signal, siginfo_t* info, void* /*context*/) {
   const int error = errno;
   if (ofThisThread != nullptr && info->si_code == BUS_ADRERR && isInSharedMap(info->si_addr) &&
       putEmptyPage(info->si_addr)) {
     ofThisThread->faults = 1;
   } else {
-    passOn(signal, info, context);
+    ::sigaction(signal, &before, nullptr);
+    ::raise(signal);  // blocked until this handler returns
   }
   errno = error;
 }

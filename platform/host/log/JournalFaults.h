@@ -8,9 +8,10 @@ namespace host {
 /// truncated. A page that is gone raises SIGBUS; as journalctl does, the handler puts an empty page
 /// there, and notes it.
 ///
-/// The handler of SIGBUS is installed while there is one of these in the process. It takes only a
-/// fault of a thread that has one, at an address in a shared map of a file, which is how the
-/// library maps journals and nothing else here is; any other goes to the handler before it.
+/// The handler of SIGBUS is installed with the first of these, and stays. It takes only a fault of
+/// a thread that has one, at an address in a shared map of a file, which is how the library maps
+/// journals and nothing else here is. Any other gives SIGBUS back to the handler before it, for
+/// good.
 ///
 /// Threads: it belongs to the thread that makes it. Of several on a thread, the last one takes the
 /// fault; they go in the opposite order.
