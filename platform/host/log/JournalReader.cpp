@@ -91,13 +91,12 @@ struct NamedValue {
   std::size_t nameSize;
 };
 
-/// Of a compressed value, as much as is uncompressed at first: unwanted ones may be huge.
-constexpr std::size_t kFirstPart = std::size_t{64} << 10;
+constexpr std::size_t kHugeEntry = std::size_t{64} << 10;
 
 constexpr std::uint64_t kBlockSize = 512;  // of st_blocks, see stat(3type)
 
-/// What is uncompressed of a wanted one: enough to see that it is too long.
-constexpr std::size_t kWantedPart = kMaxField + 1024;
+/// What is uncompressed of a value: enough to see that it is too long.
+constexpr std::size_t kMostOfAValue = kMaxField + 1024;
 
 class JournalReader final : public EntryReader {
  public:
@@ -129,14 +128,11 @@ class JournalReader final : public EntryReader {
  private:
   void begin() {
     begun = true;
-    journal.check(::sd_journal_set_data_threshold(journal.get(), kFirstPart));
+    journal.check(::sd_journal_set_data_threshold(journal.get(), kMostOfAValue));
     mayHaveMore = addMatches();
-    if (from.microsecondsSince1970() > 0) {
-      const auto since = static_cast<std::uint64_t>(from.microsecondsSince1970());
-      journal.check(::sd_journal_seek_realtime_usec(journal.get(), since));
-    } else {
-      journal.check(::sd_journal_seek_head(journal.get()));
-    }
+    const auto since = std::max(from, OSLogDate(0)).microsecondsSince1970();
+    journal.check(
+        ::sd_journal_seek_realtime_usec(journal.get(), static_cast<std::uint64_t>(since)));
   }
 
   /// Each file still has what its header says, and the library still has each file: it drops one
@@ -158,14 +154,13 @@ class JournalReader final : public EntryReader {
 
   /// False when the entry has no date that an event can have.
   bool readEntry() {
-    if (size > kFirstPart) decltype(copies)().swap(copies);  // what huge fields have left
+    if (size > kHugeEntry) decltype(copies)().swap(copies);  // it is not held on to
     current = LogEntry();
     size = 0;
     std::uint64_t date = 0;
     journal.check(::sd_journal_get_realtime_usec(journal.get(), &date));
     if (date > kMaxDate) return false;
     current.microseconds = static_cast<std::int64_t>(date);
-    ::sd_journal_restart_data(journal.get());
     const void* data = nullptr;
     std::size_t length = 0;
     while (journal.check(::sd_journal_enumerate_data(journal.get(), &data, &length)) > 0) {
@@ -176,19 +171,8 @@ class JournalReader final : public EntryReader {
 
   void take(const NamedValue& given) {
     const Field field = fieldCalled(given.name());
-    if (field == Field::none || field == Field::realtimeTimestamp || current.has(field)) return;
-    if (given.whole.size() < kFirstPart) return keep(field, given.value());
-    // All of it, if it is one that has been compressed.
-    const void* data = nullptr;
-    std::size_t length = 0;
-    ::sd_journal_set_data_threshold(journal.get(), kWantedPart);
-    const std::string name(nameOf(field));
-    journal.check(::sd_journal_get_data(journal.get(), name.c_str(), &data, &length));
-    ::sd_journal_set_data_threshold(journal.get(), kFirstPart);
-    keep(field, NamedValue(data, length).value());
-  }
-
-  void keep(Field field, std::string_view value) {
+    if (field == Field::none || current.has(field)) return;
+    const std::string_view value = given.value();
     size += value.size();
     if (value.size() > kMaxField) damagedBy("a field is too long");
     if (size > kMaxFields) damagedBy("an entry is too long");
@@ -223,7 +207,6 @@ class JournalReader final : public EntryReader {
     std::vector<std::string> matches;
     LogEntry entry;
     const LogEvent event(entry);
-    ::sd_journal_set_data_threshold(journal.get(), kWantedPart);
     const std::vector<std::string> images = uniqueValues(Field::exe);
     for (const Field field :
          {Field::comm, Field::syslogIdentifier, Field::exe, Field::senderPath}) {
@@ -236,7 +219,6 @@ class JournalReader final : public EntryReader {
         if (stop.raised()) break;
       }
     }
-    ::sd_journal_set_data_threshold(journal.get(), kFirstPart);
     return matches;
   }
 
