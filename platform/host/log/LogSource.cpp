@@ -28,14 +28,13 @@ class TextBytes final : public ByteSource {
   explicit TextBytes(std::string given) : text(std::move(given)) {}
 
   std::optional<std::size_t> read(char* buffer, std::size_t size) override {
-    const std::size_t count = text.copy(buffer, size, position);
-    position += count;
+    const std::size_t count = text.copy(buffer, size);
+    text.erase(0, count);
     return count;
   }
 
  private:
   std::string text;
-  std::size_t position = 0;
 };
 
 /// The bytes that a descriptor gives: of a file, from its start, whoever else reads it.
