@@ -161,12 +161,8 @@ fs::path folderOf(fs::path path) {
 }  // namespace
 
 std::vector<JournalFile> openJournalFiles(const std::string& journal) {
-  constexpr int kMostRotations = 100;
   std::vector<JournalFile> files = openAll(filesOf(journal));
-  for (int i = 0; identitiesOf(files) != identitiesOf(filesOf(journal)); ++i) {
-    if (i == kMostRotations) throw std::runtime_error("Cannot read the journal: it keeps changing");
-    files = openAll(filesOf(journal));
-  }
+  while (identitiesOf(files) != identitiesOf(filesOf(journal))) files = openAll(filesOf(journal));
   if (!files.empty()) return files;
   if (!journal.empty()) throw std::runtime_error("No journal: no journal files in " + journal);
   throw std::runtime_error(std::string("No journal: no journal files in ") + kKeptFolder + " or " +

@@ -216,7 +216,6 @@ class JournalReader final : public EntryReader {
         const bool passes =
             filter.passes(event) || (field == Field::comm && passesWhole(entry, images));
         if (passes) matches.push_back(std::string(nameOf(field)) + '=' + value);
-        if (stop.raised()) break;
       }
     }
     return matches;
