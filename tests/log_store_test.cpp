@@ -35,6 +35,11 @@ using Texts = std::vector<std::string>;
 
 namespace {
 
+static_assert(host::kMaxField == 32 << 20 && host::kMaxFields == 64 << 20 &&
+                  RecordedLogReader::kBuffer == 256 << 10 && host::kStreamInvalidated == 1 &&
+                  host::kStreamDamaged == 2 && host::kStreamUnreadable == 3,
+              "as the manual page says");
+
 const std::string kDate = "__REALTIME_TIMESTAMP=1700000000000000\n";
 
 const std::string kForged = "x\n\nMESSAGE=forged\n" + kDate + "\n";
@@ -241,6 +246,8 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   Delivered delivered = run(wanted, 0, OSLogDate(2'000'001));
   EXPECT_EQ(delivered.events, (Texts{"1024 0 0 0|a|a|||3@0", "1024 0 0 0|b|É|||2@0"}));
   EXPECT_EQ(delivered.reason, kOSLogEventStreamEndOfLog);
+  const auto again = OSLogEventStream::initWithSource(prepared);
+  EXPECT_EQ(run(again, 0, OSLogDate(2'000'001)).events.size(), 3U) << "without a filter";
 
   host::device().logEnd = 9;
   EXPECT_EQ(run(stream(log)).reason, 9);
@@ -412,8 +419,11 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
 
 TEST_F(Journal, RefusesAFileThatItCannotRead) {
   const std::string file = makeFile("x", logOf(10));
-  write("y.journal", "");
-  EXPECT_EQ(prepareError(folder), "Cannot read the journal: " + folder + "/y.journal: cut off");
+  for (const auto& [text, why] : {std::pair(std::string(), "cut off"),
+                                  {std::string(1000, 'x'), "no journal file, or damaged"}}) {
+    write("y.journal", text);
+    EXPECT_EQ(prepareError(folder), "Cannot read the journal: " + folder + "/y.journal: " + why);
+  }
   std::filesystem::remove(folder + "/y.journal");
   const auto late = stream(folder);
   std::filesystem::resize_file(file, 100);
