@@ -1,8 +1,0 @@
-#include <gtest/gtest.h>
-
-#include "tests/Program.h"
-
-TEST(SmallestPort, RefusesToStart) {
-  expectOutcome(run({{"help"}}),
-                {.out = "'zubtool' is not supported on this product.\n", .status = 255});
-}
