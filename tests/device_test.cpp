@@ -10,6 +10,7 @@
 #include <csignal>
 #include <filesystem>
 #include <sstream>
+#include <thread>
 
 #include "platform/host/device/Device.h"
 #include "platform/host/device/RequestLog.h"
@@ -36,20 +37,17 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
       "dump-delay = 4294967295\nhelper-timestamp = a = b\nlog = logs/x\nlog-end = never",
       profile);
   EXPECT_EQ(wrong.value_or("good"), "good");
-  EXPECT_EQ(profile.radio, 16);
-  EXPECT_EQ(profile.product, 2147483647);
-  EXPECT_EQ(profile.radioVendor, -2);
+  EXPECT_EQ(std::tuple(profile.radio, profile.product, profile.radioVendor, profile.hostProcesses),
+            std::tuple(16, 2147483647, -2, true));
   EXPECT_EQ(profile.processes, (std::vector<std::string>{"modemd", "x"}));
-  EXPECT_TRUE(profile.hostProcesses);
   ASSERT_EQ(profile.server.size(), 3U);
   EXPECT_EQ(profile.server[1].state, "Shutting down");
-  EXPECT_EQ(profile.server[2].at.count(), 250);
-  EXPECT_EQ(profile.systemLogsMode.text, "");
-  EXPECT_EQ(profile.basebandEnabled.code, static_cast<std::int32_t>(0xE020E001));
-  EXPECT_EQ(profile.dump.code, -1);
-  EXPECT_EQ(profile.dumpTimestamp, "");
-  EXPECT_EQ(profile.dumpDelay.count(), 4294967295);
-  EXPECT_EQ(profile.helperTimestamp, "a = b");
+  EXPECT_EQ(std::tuple(profile.server[2].at.count(), profile.dumpDelay.count()),
+            std::tuple(250, 4294967295));
+  EXPECT_EQ(std::tuple(profile.basebandEnabled.code, profile.dump.code),
+            std::tuple(static_cast<std::int32_t>(0xE020E001), -1));
+  EXPECT_EQ(profile.systemLogsMode.text + *profile.dumpTimestamp + *profile.helperTimestamp,
+            "a = b");
   EXPECT_EQ(profile.log, "dir/logs/x");
   EXPECT_EQ(profile.logEnd, std::nullopt);
 }
@@ -113,6 +111,24 @@ TEST(RequestLog, SaysWhyItCannotBeWritten) {
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
               path + ": cannot write the request log: " + why + "\n");
   }
+}
+
+TEST(Server, IsAskedAndKeepsHandlersWhileItsStateChanges) {
+  host::device().server.assign(50, {std::chrono::milliseconds(1), "Started"});
+  const auto owned = std::make_shared<int>();
+  const auto registerMany = [&owned] {
+    const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
+    lumo::object reply;
+    for (int i = 0; i < 100; ++i) {
+      zub::client::PerformCommand(manager, "state", {}, &reply);
+      zub::client::RegisterEventHandler(manager, zub::kEventServerStateChange,
+                                        [owned](const auto&, const auto&) {});
+    }
+  };
+  std::thread other(registerMany);
+  registerMany();
+  other.join();
+  EXPECT_EQ(owned.use_count(), 201);
 }
 
 TEST(Server, FailsADumpForWhichThereIsNoThread) {

@@ -143,7 +143,7 @@ TEST(Shell, ReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
   const CapturedOutput out;
   const TypedInput in("a\n");
   EXPECT_FALSE(shell.run({"r"}));
-  EXPECT_EQ(out.str(), "(/r)>> a (/r/s)>> a (/r/s)>> ?a /r/s:a() (/r/s)>> a ");
+  EXPECT_EQ(out.str(), "$(/r)>> a $(/r/s)>> a (/r/s)>> $$?a /r/s:a() $(/r/s)>> a ");
 }
 
 TEST(Shell, NeedsATreeButNoProgramName) {
@@ -154,7 +154,7 @@ TEST(Shell, NeedsATreeButNoProgramName) {
   EXPECT_FALSE(treeless.run({"r"}));
   EXPECT_EQ(out.str(), "");
   EXPECT_TRUE(TestShell().run({}));
-  EXPECT_EQ(out.str(), "(/r)>> ");
+  EXPECT_EQ(out.str(), "(/r)>> $$");
 }
 
 TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
@@ -175,7 +175,7 @@ TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
       });
     });
   });
-  const CapturedOutput out(true);
+  const CapturedOutput out;
   root->CommandBase::displayHelp();
   forEachRow("help", 1, [&out](const Row& row) { EXPECT_EQ(out.str(), row[0]); });
 }

@@ -61,7 +61,7 @@ TEST(ZUBCommand, SharesItsConnectionFlushesEachLineAndGivesAllBack) {
     const auto logdump = root->getSubCommandObj("logdump");
     EXPECT_EQ(logdump->getParent().lock(), root);
     EXPECT_EQ(manager.use_count(), 3);
-    const CapturedOutput out(true);
+    const CapturedOutput out;
     for (const char* handler : {"tel", "core", "bb"}) {
       EXPECT_TRUE(logdump->execCommand(handler, {}));
       EXPECT_TRUE(out.str().ends_with("\n$")) << handler;

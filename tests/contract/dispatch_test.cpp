@@ -29,12 +29,10 @@ TEST(Group, WaitEndsWithTheLastLeaveOnAnotherThread) {
   for (int round = 0; round < 2000; ++round) {
     const auto group = dispatch::group::create();
     std::atomic<int> ended = 0;
-    std::thread one([&ended, member = dispatch::membership(group)] { ++ended; });
-    std::thread other([&ended, member = dispatch::membership(group)] { ++ended; });
+    const std::jthread one([&ended, member = dispatch::membership(group)] { ++ended; });
+    const std::jthread other([&ended, member = dispatch::membership(group)] { ++ended; });
     group.wait();
     EXPECT_EQ(ended, 2);
-    one.join();
-    other.join();
   }
 }
 

@@ -94,9 +94,8 @@ TEST_F(LogStore, IsInvalidatedFromAnywhere) {
   stream->invalidate();
   EXPECT_TRUE(run(tenMinutesAgo).empty()) << "invalidated before it was activated";
   renew();
-  std::thread other([this] { stream->invalidate(); });
+  const std::jthread other([this] { stream->invalidate(); });
   run(tenMinutesAgo);
-  other.join();
 }
 
 TEST_F(LogStore, RunsToItsEndWhenItsMakerReleasesIt) {
