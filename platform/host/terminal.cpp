@@ -163,6 +163,10 @@ Editor::Editor() {
   HistEventW event;
   lib.history_w(history, &event, H_SETSIZE, kHistory);
   lib.history_w(history, &event, H_SETUNIQUE, 1);
+  // Its use of a terminal that inserts loses text where a line has several rows.
+  for (const auto* const capability : {L"ic", L"im", L"IC"}) {
+    lib.el_wset(edit, EL_SETTC, capability, L"", nullptr);
+  }
   lib.el_wset(edit, EL_EDITOR, L"emacs");
   lib.el_wset(edit, EL_HIST, lib.history_w, history);
   lib.el_wset(
