@@ -5,7 +5,6 @@
 #include <pty.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
-#include <termios.h>
 #include <unistd.h>
 
 #include <csignal>
@@ -40,16 +39,15 @@ void expectOutcome(const Outcome& actual, const Outcome& expected) {
 Program::Program(const Start& start) {
   writeFile(scratch->path("device"),
             start.profile + "\nrequest-log = " + scratch->path("requests") + "\n");
-  termios plain{};  // no echo, no translation of line ends: the output is the program's own
-  cfmakeraw(&plain);
-  plain.c_lflag |= ICANON;
+  const termios settings = terminalBefore();
+  const winsize size = {.ws_row = 24, .ws_col = 80, .ws_xpixel = 0, .ws_ypixel = 0};
   int input[2];
   int output[2];
   if (pipe2(input, O_CLOEXEC) != 0 || pipe2(output, O_CLOEXEC) != 0) throw std::bad_alloc();
   // As another program that shares them may have left them.
   fcntl(input[0], F_SETFL, O_NONBLOCK);
   fcntl(output[1], F_SETFL, O_NONBLOCK);
-  process = start.onTerminal ? forkpty(&out, nullptr, &plain, nullptr) : fork();
+  process = start.onTerminal ? forkpty(&out, nullptr, &settings, &size) : fork();
   if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
   if (process == 0) execute(start, input[0], output[1]);
   close(input[0]);
@@ -82,12 +80,22 @@ void Program::execute(const Start& start, int input, int output) const {
   } else {
     command.front() = start.name;
   }
+  if (!start.shell.empty()) command = {"sh", "-mc", start.shell, "sh", ZUBTOOL_PROGRAM};
   command.insert(command.end(), start.words.begin(), start.words.end());
   std::vector<char*> arguments;
   for (auto& word : command) arguments.push_back(word.data());
   arguments.push_back(nullptr);
-  execvp(isEmulated ? arguments.front() : ZUBTOOL_PROGRAM, arguments.data());
+  const bool isNamed = !isEmulated && start.shell.empty();
+  execvp(isNamed ? ZUBTOOL_PROGRAM : arguments.front(), arguments.data());
   _exit(127);
+}
+
+termios Program::terminalBefore() {
+  termios plain{};  // no echo, no translation of line ends: the output is the program's own
+  cfmakeraw(&plain);
+  plain.c_lflag |= ICANON | ISIG;
+  plain.c_cc[VSUSP] = '\x1A';
+  return plain;
 }
 
 void Program::type(const std::string& text) const {

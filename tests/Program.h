@@ -1,6 +1,7 @@
 #pragma once
 
 #include <sys/types.h>
+#include <termios.h>
 
 #include <filesystem>
 #include <memory>
@@ -33,6 +34,7 @@ struct Start {
   std::string name = "zubtool";                      ///< under which the program is invoked
   bool onTerminal = false;    ///< a pseudo-terminal stands for all three standard streams
   std::string term = "dumb";  ///< the kind of terminal, TERM
+  std::string shell = {};     ///< a script of sh(1) with job control that runs it, as "$@"
 };
 
 /// What one run of the program left behind.
@@ -59,6 +61,9 @@ class Program {
 
   /// Ends its standard input and waits for its end. Called once.
   Outcome finish();
+
+  /// The settings of a terminal that a program is started on.
+  static termios terminalBefore();
 
   pid_t pid() const { return process; }
   int terminal() const { return out; }  ///< its controlling side, where the program has one
