@@ -72,7 +72,7 @@ set(CPACK_DEBIAN_PACKAGE_MAINTAINER "${contact}")
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_SECTION utils)
 set(CPACK_DEBIAN_PACKAGE_PRIORITY optional)
-set(CPACK_DEBIAN_PACKAGE_RECOMMENDS libedit2)  # opened when there is a terminal to edit on
+set(CPACK_DEBIAN_PACKAGE_RECOMMENDS "libedit2, libsystemd0")  # opened at their first use
 set(CPACK_PACKAGE_DESCRIPTION
     "zubtool asks the baseband manager server to collect telephony logs,
 telephony logs with a core dump of the modem, or baseband traces, and

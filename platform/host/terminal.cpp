@@ -149,7 +149,7 @@ class Editor {
 
 /// Opens the library on the terminal, unless it does not know that kind of terminal.
 Editor::Editor() {
-  if (!lib.isThere) return;
+  if (!lib.isThere()) return;
   std::FILE* const complaints = std::fopen("/dev/null", "we");
   if (complaints == nullptr) return;
   edit = lib.el_init("zubtool", stdin, stdout, complaints);

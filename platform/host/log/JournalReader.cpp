@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
-#include <systemd/sd-journal.h>
 
 #include <algorithm>
 #include <array>
@@ -15,9 +14,12 @@
 #include <vector>
 
 #include "platform/host/log/JournalFaults.h"
+#include "platform/host/log/Libsystemd.h"
 
 namespace host {
 namespace {
+
+const Libsystemd& lib() { return Libsystemd::shared(); }
 
 constexpr std::string_view kCannotRead = "Cannot read the journal: ";
 
@@ -51,7 +53,7 @@ class OpenJournal {
     }
     sd_journal* opened = nullptr;
     const auto count = static_cast<unsigned>(numbers.size());
-    const int result = ::sd_journal_open_files_fd(&opened, numbers.data(), count, 0);
+    const int result = lib().sd_journal_open_files_fd(&opened, numbers.data(), count, 0);
     if (result >= 0) {
       journal.reset(opened);
       for (posix::Descriptor& copy : copies) copy.release();  // they are the library's now
@@ -70,7 +72,7 @@ class OpenJournal {
 
  private:
   struct Close {
-    void operator()(sd_journal* opened) const { ::sd_journal_close(opened); }
+    void operator()(sd_journal* opened) const { lib().sd_journal_close(opened); }
   };
 
   JournalFaults faults;
@@ -109,7 +111,7 @@ class JournalReader final : public EntryReader {
     while (!stop.raised()) {
       constexpr unsigned kEntriesAtATime = 256;
       if (entries++ % kEntriesAtATime == 0) beforeWaiting();
-      if (!mayHaveMore || journal.check(::sd_journal_next(journal.get())) == 0) {
+      if (!mayHaveMore || journal.check(lib().sd_journal_next(journal.get())) == 0) {
         checkFiles();
         return Result::end;
       }
@@ -128,11 +130,11 @@ class JournalReader final : public EntryReader {
  private:
   void begin() {
     begun = true;
-    journal.check(::sd_journal_set_data_threshold(journal.get(), kMostOfAValue));
+    journal.check(lib().sd_journal_set_data_threshold(journal.get(), kMostOfAValue));
     mayHaveMore = addMatches();
     const auto since = std::max(from, OSLogDate(0)).microsecondsSince1970();
     journal.check(
-        ::sd_journal_seek_realtime_usec(journal.get(), static_cast<std::uint64_t>(since)));
+        lib().sd_journal_seek_realtime_usec(journal.get(), static_cast<std::uint64_t>(since)));
   }
 
   /// Each file still has what its header says, and the library still has each file: it drops one
@@ -146,7 +148,7 @@ class JournalReader final : public EntryReader {
       present += static_cast<std::uint64_t>(about.st_blocks) * kBlockSize;
     }
     std::uint64_t used = 0;
-    if (::sd_journal_get_usage(journal.get(), &used) < 0 || used < present) {
+    if (lib().sd_journal_get_usage(journal.get(), &used) < 0 || used < present) {
       throw std::runtime_error(std::string(kCannotRead) +
                                "files were dropped, for too little memory?");
     }
@@ -158,12 +160,12 @@ class JournalReader final : public EntryReader {
     current = LogEntry();
     size = 0;
     std::uint64_t date = 0;
-    journal.check(::sd_journal_get_realtime_usec(journal.get(), &date));
+    journal.check(lib().sd_journal_get_realtime_usec(journal.get(), &date));
     if (date > kMaxDate) return false;
     current.microseconds = static_cast<std::int64_t>(date);
     const void* data = nullptr;
     std::size_t length = 0;
-    while (journal.check(::sd_journal_enumerate_data(journal.get(), &data, &length)) > 0) {
+    while (journal.check(lib().sd_journal_enumerate_data(journal.get(), &data, &length)) > 0) {
       take(NamedValue(data, length));
     }
     return true;
@@ -197,8 +199,8 @@ class JournalReader final : public EntryReader {
     const std::vector<std::string> matches = findMatches();
     if (matches.size() > kMostMatches) return true;
     for (const std::string& match : matches) {
-      journal.check(::sd_journal_add_match(journal.get(), match.data(), match.size()));
-      journal.check(::sd_journal_add_disjunction(journal.get()));
+      journal.check(lib().sd_journal_add_match(journal.get(), match.data(), match.size()));
+      journal.check(lib().sd_journal_add_disjunction(journal.get()));
     }
     return !matches.empty();
   }
@@ -235,11 +237,11 @@ class JournalReader final : public EntryReader {
   std::vector<std::string> uniqueValues(Field field) {
     std::vector<std::string> values;
     const std::string name(nameOf(field));
-    journal.check(::sd_journal_query_unique(journal.get(), name.c_str()));
+    journal.check(lib().sd_journal_query_unique(journal.get(), name.c_str()));
     const void* data = nullptr;
     std::size_t length = 0;
     while (!stop.raised() &&
-           journal.check(::sd_journal_enumerate_unique(journal.get(), &data, &length)) > 0) {
+           journal.check(lib().sd_journal_enumerate_unique(journal.get(), &data, &length)) > 0) {
       values.emplace_back(NamedValue(data, length).value());
     }
     return values;
