@@ -103,7 +103,9 @@ class Terminal : public testing::Test {
   /// Starts it where lines are edited.
   void SetUp() override {
     start({.profile = kProfile, .onTerminal = true, .term = "xterm-256color"});
-    if (isAsItWas(program->terminal())) GTEST_SKIP() << "no line editing in this build";
+#ifndef ZUB_EDITS_LINES
+    GTEST_SKIP() << "no line editing in this build";
+#endif
   }
 
   /// Shows what is printed up to and with `end`, `times` times.
