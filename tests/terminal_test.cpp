@@ -133,17 +133,21 @@ TEST_F(Terminal, EditsLinesAndRunsWhatTheyBecome) {
     int prompts = 1;         // that show after the keys
     std::string above = {};  // shown besides
   } cases[] = {
-      {kTel + "ac\033[Db\r", {"abc"}},               // left
-      {"tel x\033[Hlogdump \r", {"x"}},              // to the start
-      {rows + "\001" + kTel + "\r", {rows}},         // likewise, in front of other rows
-      {"lo\tt\tq\r", {"q"}},                         // sub-command and handler
-      {kTel + "ef\033[D\004\r", {"e"}},              // a character taken away
-      {kTel + "nonui\027w\r", {"w"}},                // a word taken back
-      {kTel + "1\r\033[A2\r", {"1", "12"}, 2},       // the line before
-      {"\022q\033[F2\r", {"q2"}},                    // a search
-      {kTel + "a\rlogdump tel b\r", {"a", "b"}, 2},  // a paste
-      {"logdump \ttel d\r", {"d"}, 2, kPrompt + "logdump\n" + offered},
-      {"logdump \t\014tel c\r", {"c"}, 3},  // a list, and the screen cleared
+      {kTel + "ac\033[Db\r", {"abc"}},                                 // left
+      {"tel x\033[Hlogdump \r", {"x"}},                                // to the start
+      {rows + "\001" + kTel + "\r", {rows}},                           // of many rows
+      {"tel ac\033[7~logdump \033[8~\033[1;5Db\033[4~d\r", {"bacd"}},  // other terminals'
+      {"Xlogdump t e\033[1~\033[3~\033[1;5C\033[1;5Cel\r", {"e"}},     // keys
+      {kTel + "\033[2~\033[5~\033[6~\033x\033Xn\r", {"n"}},            // and without use
+      {kTel + "ef\033[D\004\r", {"e"}},                                // a character less
+      {kTel + "nonui\027\xC3\xA9\r", {"\xC3\xA9"}},                    // a word less
+      {kTel + "u\r" + kTel + "v\r" + kTel + "v\r\033[A\033[Aw\r", {"u", "v", "v", "uw"}, 4},
+      {" \r\033[A2\r", {"uw2"}, 2, "(/zubtool)>>\n"},                    // the line before
+      {"\0222x\010\022\033[D\r", {rows}},                                // a search
+      {kTel + "a\rlogdump tel b\r", {"a", "b"}, 2},                      // a paste
+      {"lo\tt\tq\r", {"q"}},                                             // sub-command, handler
+      {"logdump \ttel d\r", {"d"}, 2, kPrompt + "logdump\n" + offered},  // a list
+      {"logdump \t\014tel c\r", {"c"}, 3},                               // and a clear screen
   };
   std::vector<std::string> all;
   for (const auto& [keys, reasons, prompts, above] : cases) {
@@ -186,35 +190,38 @@ TEST_F(Terminal, IsDrawnAnewWhenItsSizeChanges) {
   const std::string reason(50, 'r');
   program->type("tel " + reason.substr(1));
   show(reason.substr(1));
-  screen.columns = 70;
-  const winsize size = {.ws_row = 24, .ws_col = 70, .ws_xpixel = 0, .ws_ypixel = 0};
+  screen.columns = 30;
+  const winsize size = {.ws_row = 4, .ws_col = 30, .ws_xpixel = 0, .ws_ypixel = 0};
   ioctl(program->terminal(), TIOCSWINSZ, &size);
-  show("tel " + reason.substr(1));
-  program->type("r\001logdump \r");
   show(kPrompt);
-  EXPECT_EQ(screen.text(), shownFor(kTel + reason) + "(/zubtool)>>");
+  program->type("r\001logdump \t\r");
+  show(kPrompt, 2);
+  const std::string list = "bb     cd     core   help\n... 2 more\n";
+  EXPECT_EQ(screen.text(),
+            kPrompt + kTel + reason + '\n' + list + shownFor(kTel + reason) + "(/zubtool)>>");
   expectRequests({reason});
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
+  const auto reason = std::string(100, 'r') + 'z';
   screen = {};
   start({.profile = kProfile,
          .onTerminal = true,
          .term = "xterm-256color",
          .shell = R"("$@"; echo; echo stopped; read -r line; fg >/dev/null)"});
-  program->type(kTel + "a");
-  show("tel a");
+  program->type(kTel + reason);
+  show("rz");
   program->type("\032");
   show("stopped\n");
   EXPECT_TRUE(isAsItWas(program->terminal()));
   program->type("\n");
-  show("tel a");
+  show("rz");
   program->type("b\r");
   show(kPath);  // after the line has perhaps been drawn twice
   show(kPrompt);
-  EXPECT_EQ(screen.text(),
-            kPrompt + kTel + "a\nstopped\n" + shownFor(kTel + "ab") + "(/zubtool)>>");
-  expectRequests({"ab"});
+  EXPECT_EQ(screen.text(), kPrompt + kTel + reason + "\nstopped\n" + shownFor(kTel + reason + 'b') +
+                               "(/zubtool)>>");
+  expectRequests({reason + 'b'});
 }
 
 TEST_F(Terminal, IsAsItWasHoweverTheProgramEnds) {

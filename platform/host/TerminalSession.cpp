@@ -10,7 +10,6 @@
 #include <cerrno>
 #include <cstdlib>
 #include <ctime>
-#include <utility>
 
 namespace host {
 namespace {
@@ -147,7 +146,7 @@ TerminalSession::~TerminalSession() {
 }
 
 TerminalSession::Event TerminalSession::wait(int milliseconds) {
-  if (!std::exchange(hasWaited, true)) tcgetattr(STDIN_FILENO, &gEditing);
+  tcgetattr(STDIN_FILENO, &gEditing);
   pollfd input = {.fd = STDIN_FILENO, .events = POLLIN, .revents = 0};
   const timespec limit = {.tv_sec = milliseconds / 1000,
                           .tv_nsec = milliseconds % 1000 * 1'000'000L};

@@ -30,14 +30,12 @@ class TerminalSession {
   /// Puts the settings back.
   ~TerminalSession();
 
-  /// Waits for input for `milliseconds`, or without end for -1. From the first call on, the
-  /// settings of the terminal that it finds are those for editing; it sets them anew when the
-  /// process goes on after a stop.
+  /// Waits for input for `milliseconds`, or without end for -1. The settings of the terminal that
+  /// it finds are those for editing; it sets them anew when the process goes on after a stop.
   Event wait(int milliseconds);
 
  private:
   sigset_t signalsBefore{};
-  bool hasWaited = false;
 };
 
 }  // namespace host

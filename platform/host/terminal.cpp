@@ -73,7 +73,7 @@ std::size_t widthOf(std::wstring_view text) {
     } else if (const int columns = wcwidth(character); columns >= 0) {
       width += static_cast<std::size_t>(std::max(columns, 1));
     } else {
-      width += character > 0xFFFF ? 8 : 7;  // \U+DC80
+      width += 7;  // \U+DC80
     }
   }
   return width;
