@@ -11,117 +11,100 @@
 namespace {
 
 const std::string kPrompt = "(/zubtool)>> ";
+const std::string kAtTheEnd = "(/zubtool)>>";
 const std::string kTel = "logdump tel ";
 const std::string kPath = "/private/var/wireless/Library/Logs/CrashVault/Baseband/log-bb-T.tar.gz";
-
-/// What it asks for collections with these `reasons`.
-std::string requestsOf(const std::vector<std::string>& reasons) {
-  std::string requests;
-  for (const auto& reason : reasons) {
-    requests +=
-        "GetTraceProperty {TraceName=\"TraceSystemLogs\", TracePropertyName=\"TraceMode\"}\n"
-        "TraceDumpState {TraceAction=\"CollectTelephonyLogs\", TraceDumpStateReason=\"[zubtool] " +
-        reason + "\", TraceDumpStatePerformCompression=1}\n";
-  }
-  return requests;
-}
 
 /// What it shows for a line that collects, with the line.
 std::string shownFor(const std::string& line) {
   return kPrompt + line + "\nTelephony log collection: Success\nPath = " + kPath + '\n';
 }
 
-/// What a terminal such as xterm shows, as far as the line editor goes; it never scrolls. A
-/// character is a byte, and one in the last column is never followed by a line end.
-struct Screen {
-  void print(const std::string& bytes) {
-    for (std::size_t i = 0; i < bytes.size(); ++i) {
-      if (bytes.compare(i, 2, "\033[") == 0) {
-        const auto end = bytes.find_first_not_of("0123456789;", i + 2);
-        control(bytes.at(end), std::max(1UL, std::strtoul(&bytes[i + 2], nullptr, 10)));
-        i = end;
-      } else if (bytes[i] == '\r' || bytes[i] == '\n') {
-        cursor = row() + (bytes[i] == '\n' ? columns : 0);
-      } else if (bytes[i] == '\b') {
-        --cursor;
-      } else if (bytes[i] != '\a') {
-        cells.at(cursor++) = bytes[i];
-      }
-    }
-  }
-
-  void control(char function, std::size_t count) {
-    EXPECT_NE(std::string("ACGHJKPm").find(function), std::string::npos) << function;
-    const auto end = function == 'J' ? cells.size() : row() + columns;
-    if (function == 'A') cursor -= count * columns;
-    if (function == 'C') cursor += count;
-    if (function == 'G') cursor = row() + count - 1;
-    if (function == 'H') cursor = 0;
-    if (function == 'J' || function == 'K') cells.replace(cursor, end - cursor, end - cursor, ' ');
-    if (function == 'P') cells.insert(end, count, ' ').erase(cursor, count);
-  }
-
-  /// Its lines, without the blanks at their ends. One that fills a row runs on in the next.
-  std::string text() const {
-    std::string text;
-    for (std::size_t i = 0; i < cells.size(); i += columns) {
-      text += cells.substr(i, columns);
-      if (text.back() != ' ') continue;
-      text.resize(text.find_last_not_of(' ') + 1);
-      text += '\n';
-    }
-    return text.substr(0, text.find_last_not_of('\n') + 1);
-  }
-
-  std::size_t row() const { return cursor - cursor % columns; }
-
-  std::size_t columns = 80;
-  std::string cells = std::string(20 * columns, ' ');
+/// The lines that a terminal such as xterm shows of `bytes`, as far as the line editor goes. A
+/// character is a byte; a line that fills a row runs on in the next.
+std::string shown(const std::string& bytes, std::size_t columns = 80) {
+  std::string cells(1600, ' ');
   std::size_t cursor = 0;
-};
-
-std::vector<tcflag_t> settingsOf(const termios& terminal) {
-  return {terminal.c_iflag, terminal.c_oflag, terminal.c_lflag, terminal.c_cc[VMIN],
-          terminal.c_cc[VTIME]};
+  for (std::size_t i = 0; i < bytes.size(); ++i) {
+    const auto row = cursor - cursor % columns;
+    if (bytes[i] == '\r' || bytes[i] == '\n') {
+      cursor = row + (bytes[i] == '\n' ? columns : 0);
+    } else if (bytes[i] == '\b') {
+      --cursor;
+    } else if (bytes[i] != '\a' && bytes[i] != '\033') {
+      cells.at(cursor++) = bytes[i];
+    } else if (bytes[i] == '\033') {
+      const auto count = std::max(1UL, std::strtoul(&bytes[i + 2], nullptr, 10));
+      i = bytes.find_first_not_of("[0123456789;", i + 1);
+      const auto end = bytes[i] == 'J' ? cells.size() : row + columns;
+      const std::string blanks(end - cursor, ' ');
+      EXPECT_NE(std::string("ACGHJKPm").find(bytes[i]), std::string::npos) << bytes[i];
+      if (bytes[i] == 'A') cursor -= count * columns;
+      if (bytes[i] == 'C') cursor += count;
+      if (bytes[i] == 'G') cursor = row + count - 1;
+      if (bytes[i] == 'H') cursor = 0;
+      if (bytes[i] == 'J' || bytes[i] == 'K') cells.replace(cursor, blanks.size(), blanks);
+      if (bytes[i] == 'P') cells.insert(end, count, ' ').erase(cursor, count);
+    }
+  }
+  std::string text;
+  for (std::size_t i = 0; i < cells.size(); i += columns) {
+    text += cells.substr(i, columns);
+    if (text.back() == ' ') text.replace(text.find_last_not_of(' ') + 1, columns, "\n");
+  }
+  return text.substr(0, text.find_last_not_of('\n') + 1);
 }
 
 /// Whether the settings of a terminal are those it had before the program began.
 bool isAsItWas(int terminal) {
+  const auto settingsOf = [](const termios& one) {
+    return std::tuple(one.c_iflag, one.c_oflag, one.c_lflag, one.c_cc[VMIN], one.c_cc[VTIME]);
+  };
   termios now{};
   tcgetattr(terminal, &now);
   return settingsOf(now) == settingsOf(Program::terminalBefore());
 }
 
-/// The program at its prompt, and the screen in front of it.
+/// The program at its prompt, where lines are edited.
 class Terminal : public testing::Test {
  protected:
-  void start(const Start& how) {
-    program.emplace(how);
-    show(kPrompt);
-  }
-
-  /// Starts it where lines are edited.
   void SetUp() override {
-    start({.profile = kProfile, .onTerminal = true, .term = "xterm-256color"});
 #ifndef ZUB_EDITS_LINES
     GTEST_SKIP() << "no line editing in this build";
 #endif
+    start("xterm-256color");
   }
 
-  /// Shows what is printed up to and with `end`, `times` times.
-  void show(const std::string& end, int times = 1) {
-    for (; times > 0; --times) screen.print(program->readUntil(end));
+  void start(const std::string& term, const std::string& shell = "") {
+    program.emplace(Start{.profile = "dump-timestamp = T\ndump-delay = 50",
+                          .onTerminal = true,
+                          .term = term,
+                          .shell = shell});
+    printed.clear();
+    read(kPrompt);
+  }
+
+  /// Reads what is printed up to and with `end`, `times` times.
+  void read(const std::string& end, int times = 1) {
+    for (; times > 0; --times) printed += program->readUntil(end);
   }
 
   /// Ends the input, of which nothing may show.
   void expectRequests(const std::vector<std::string>& reasons) {
     program->type("\004");
-    expectOutcome(program->finish(), {.status = 1, .requests = requestsOf(reasons)});
+    std::string requests;
+    for (const auto& reason : reasons) {
+      requests +=
+          "GetTraceProperty {TraceName=\"TraceSystemLogs\", TracePropertyName=\"TraceMode\"}\n"
+          "TraceDumpState {TraceAction=\"CollectTelephonyLogs\", "
+          "TraceDumpStateReason=\"[zubtool] " +
+          reason + "\", TraceDumpStatePerformCompression=1}\n";
+    }
+    expectOutcome(program->finish(), {.status = 1, .requests = requests});
   }
 
-  const std::string kProfile = "dump-timestamp = T\ndump-delay = 50\n";
   std::optional<Program> program;
-  Screen screen;
+  std::string printed;
 };
 
 TEST_F(Terminal, EditsLinesAndRunsWhatTheyBecome) {
@@ -151,77 +134,69 @@ TEST_F(Terminal, EditsLinesAndRunsWhatTheyBecome) {
   };
   std::vector<std::string> all;
   for (const auto& [keys, reasons, prompts, above] : cases) {
+    printed = kPrompt;
     program->type(keys);
-    show(kPrompt, prompts);
-    auto shown = above;
-    for (const auto& reason : reasons) shown += shownFor(kTel + reason);
-    EXPECT_EQ(screen.text(), shown + "(/zubtool)>>");
+    read(kPrompt, prompts);
+    auto expected = above;
+    for (const auto& reason : reasons) expected += shownFor(kTel + reason);
+    EXPECT_EQ(shown(printed), expected + kAtTheEnd);
     all.insert(all.end(), reasons.begin(), reasons.end());
-    screen = {};
-    screen.print(kPrompt);
   }
   expectRequests(all);
 }
 
 TEST_F(Terminal, TakesAnyBytesAndAsManyAsAreTyped) {
-  const std::string bytes = "\xFF\xC3\xA9\xC2\x85\xED\xA0\x80\x80z\xE9";
-  const std::string block(500, 'x');  // the terminal holds 4096 bytes each way
   std::string reason;
   program->type(kTel);
-  for (int i = 0; i < 40; ++i, reason += block) {
-    program->type(block);
-    program->readUntil(std::string(8, 'x'));
+  for (int i = 0; i < 40; ++i) {  // the terminal holds 4096 bytes each way
+    program->type(std::string(500, 'x'));
+    reason += std::string(500, 'x');
+    read(std::string(8, 'x'));
   }
-  program->type(bytes + "\r");
-  program->readUntil(kPrompt);
-  expectRequests({reason + bytes});
+  reason += "\xFF\xC3\xA9\xC2\x85\xED\xA0\x80\x80z\xE9";
+  program->type(reason.substr(20000) + "\r");
+  read(kPrompt);
+  expectRequests({reason});
 }
 
 TEST_F(Terminal, IsAsItWasWhileACommandRuns) {
   program->type(kTel + "a\r");
   while (!isAsItWas(program->terminal())) sched_yield();
   program->type(kTel + "b\r");  // which is kept for the prompt
-  show(kPrompt, 2);
-  EXPECT_EQ(screen.text(), shownFor(kTel + "a") + shownFor(kTel + "b") + "(/zubtool)>>");
+  read(kPrompt, 2);
+  EXPECT_EQ(shown(printed), shownFor(kTel + "a") + shownFor(kTel + "b") + kAtTheEnd);
   expectRequests({"a", "b"});
 }
 
 TEST_F(Terminal, IsDrawnAnewWhenItsSizeChanges) {
   const std::string reason(50, 'r');
   program->type("tel " + reason.substr(1));
-  show(reason.substr(1));
-  screen.columns = 30;
+  read(reason.substr(1));
   const winsize size = {.ws_row = 4, .ws_col = 30, .ws_xpixel = 0, .ws_ypixel = 0};
   ioctl(program->terminal(), TIOCSWINSZ, &size);
-  show(kPrompt);
+  read(kPrompt);
   program->type("r\001logdump \t\r");
-  show(kPrompt, 2);
-  const std::string list = "bb     cd     core   help\n... 2 more\n";
-  EXPECT_EQ(screen.text(),
-            kPrompt + kTel + reason + '\n' + list + shownFor(kTel + reason) + "(/zubtool)>>");
+  read(kPrompt, 2);
+  EXPECT_EQ(shown(printed, 30), kPrompt + kTel + reason +
+                                    "\nbb     cd     core   help\n... 2 more\n" +
+                                    shownFor(kTel + reason) + kAtTheEnd);
   expectRequests({reason});
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
-  const auto reason = std::string(100, 'r') + 'z';
-  screen = {};
-  start({.profile = kProfile,
-         .onTerminal = true,
-         .term = "xterm-256color",
-         .shell = R"("$@"; echo; echo stopped; read -r line; fg >/dev/null)"});
-  program->type(kTel + reason);
-  show("rz");
+  const auto line = kTel + std::string(100, 'r') + 'z';
+  start("xterm-256color", R"("$@"; echo; echo stopped; read -r line; fg >/dev/null)");
+  program->type(line);
+  read("rz");
   program->type("\032");
-  show("stopped\n");
+  read("stopped\n");
   EXPECT_TRUE(isAsItWas(program->terminal()));
   program->type("\n");
-  show("rz");
+  read("rz");
   program->type("b\r");
-  show(kPath);  // after the line has perhaps been drawn twice
-  show(kPrompt);
-  EXPECT_EQ(screen.text(), kPrompt + kTel + reason + "\nstopped\n" + shownFor(kTel + reason + 'b') +
-                               "(/zubtool)>>");
-  expectRequests({reason + 'b'});
+  read(kPath);  // after the line has perhaps been drawn twice
+  read(kPrompt);
+  EXPECT_EQ(shown(printed), kPrompt + line + "\nstopped\n" + shownFor(line + 'b') + kAtTheEnd);
 }
 
 TEST_F(Terminal, IsAsItWasHoweverTheProgramEnds) {
@@ -232,13 +207,13 @@ TEST_F(Terminal, IsAsItWasHoweverTheProgramEnds) {
     EXPECT_EQ(program->finish().status, signal == 0 ? 0 : 1000 + signal);
     EXPECT_TRUE(isAsItWas(terminal)) << signal;
     close(terminal);
-    start({.onTerminal = true, .term = "xterm-256color"});
+    start("xterm-256color");
   }
 }
 
 TEST_F(Terminal, IsReadAsBeforeWhereItsKindIsNotKnown) {
   for (const std::string term : {"dumb", "", "no-such-terminal"}) {
-    start({.onTerminal = true, .term = term});
+    start(term);
     EXPECT_TRUE(isAsItWas(program->terminal())) << term;
     program->type("quit\n");
     EXPECT_EQ(program->finish().out, "") << term;
