@@ -109,8 +109,9 @@ void BM_ExportBadlyEncoded(benchmark::State& state) {
     host::device().log = folder.file(name);
     if (!OsLogStream::putOsLogStreamToFile(folder.file("out"), {}, {}, kAllHistory)) std::abort();
   };
-  bench::compare(
-      state, [&] { exportOf("latin"); }, [&] { exportOf("ascii"); });
+  const auto latin = [&] { exportOf("latin"); };
+  const auto ascii = [&] { exportOf("ascii"); };
+  bench::compare(state, latin, ascii);
 }
 
 void BM_ExportMemory(benchmark::State& state) {

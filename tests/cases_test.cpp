@@ -133,8 +133,8 @@ class CaseTest : public testing::Test {
     if (file.path().extension() != ".cases") continue;
     for (const auto& one : CaseFile(file.path()).cases) {
       auto name = one.name;
-      std::ranges::replace_if(
-          name, [](unsigned char byte) { return !std::isalnum(byte); }, '_');
+      const auto isMark = [](unsigned char byte) { return !std::isalnum(byte); };
+      std::ranges::replace_if(name, isMark, '_');
       testing::RegisterTest(
           file.path().stem().c_str(), name.c_str(), nullptr, nullptr, file.path().c_str(), one.line,
           [file, one]() -> testing::Test* { return new CaseTest(file.path(), one); });
