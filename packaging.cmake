@@ -25,7 +25,8 @@ install(FILES completions/_zubtool DESTINATION ${CMAKE_INSTALL_DATADIR}/zsh/vend
 install(FILES completions/zubtool.fish
         DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d)
 
-# Man pages name the folder that they are installed to, and are compressed where that is possible.
+# Man pages name the version, and the folder that they are installed to; they are compressed where
+# that is possible.
 find_program(GZIP gzip)
 file(MAKE_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR}/docs)
 foreach(page zubtool.1 ${host_pages})
@@ -33,8 +34,9 @@ foreach(page zubtool.1 ${host_pages})
   set(source ${CMAKE_CURRENT_SOURCE_DIR}/docs/${page})
   set(made ${CMAKE_CURRENT_BINARY_DIR}/docs/${page})
   set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${source})
-  execute_process(COMMAND sed -e "${of_another_platform}" ${source} OUTPUT_FILE ${made}
-                  COMMAND_ERROR_IS_FATAL ANY)
+  execute_process(COMMAND sed -e "${of_another_platform}" -e "s/^[.]Os .*/& ${PROJECT_VERSION}/"
+                          ${source}
+                  OUTPUT_FILE ${made} COMMAND_ERROR_IS_FATAL ANY)
   install(FILES ${made} DESTINATION ${CMAKE_INSTALL_MANDIR}/man${section})
   list(APPEND compressed ${CMAKE_INSTALL_MANDIR}/man${section}/${page})
 endforeach()
