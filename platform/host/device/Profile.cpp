@@ -69,11 +69,11 @@ bool readFault(std::string_view text, Answer& answer) {
   if (!text.starts_with('!')) return false;
   text.remove_prefix(1);
   if (text == "null") {
-    answer = {.kind = Answer::Kind::nullReply, .text = {}};
+    answer = {.kind = Answer::Kind::nullReply};
     return true;
   }
   if (text == "empty") {
-    answer = {.kind = Answer::Kind::emptyReply, .text = {}};
+    answer = {.kind = Answer::Kind::emptyReply};
     return true;
   }
   std::int64_t code = 0;
@@ -81,7 +81,7 @@ bool readFault(std::string_view text, Answer& answer) {
       code > std::numeric_limits<std::uint32_t>::max()) {
     return false;
   }
-  answer = {.kind = Answer::Kind::error, .text = {}, .code = static_cast<std::int32_t>(code)};
+  answer = {.kind = Answer::Kind::error, .code = static_cast<std::int32_t>(code)};
   return true;
 }
 

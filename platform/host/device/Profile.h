@@ -15,7 +15,7 @@ namespace host {
 struct Answer {
   enum class Kind { value, error, nullReply, emptyReply };
   Kind kind = Kind::value;
-  std::string text;       ///< of a value, where the request has one
+  std::string text = {};  ///< of a value, where the request has one
   std::int32_t code = 0;  ///< of an error
 
   friend bool operator==(const Answer&, const Answer&) = default;
