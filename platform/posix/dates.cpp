@@ -63,8 +63,8 @@ OSLogDate OSLogDate::addingSeconds(double seconds) const {
 
 void OSLogDate::appendDescription(std::string& text) const {
   // Of the events of a log, most come in the same second as the one before.
-  thread_local std::int64_t knownSeconds = std::numeric_limits<std::int64_t>::max();
-  thread_local DateText known;
+  static thread_local std::int64_t knownSeconds = std::numeric_limits<std::int64_t>::max();
+  static thread_local DateText known;
   const std::int64_t seconds = wholeSeconds(*this);
   if (seconds != knownSeconds) {
     known = describe(seconds);
@@ -80,7 +80,7 @@ std::int32_t OSLogTimeZone::secondsFromGMT(OSLogDate date) const {
     std::int64_t seconds;
     std::int32_t offset;
   };
-  thread_local Known known{std::numeric_limits<std::int64_t>::max(), 0};
+  static thread_local Known known{std::numeric_limits<std::int64_t>::max(), 0};
   const std::int64_t seconds = wholeSeconds(date);
   if (seconds != known.seconds) known = {seconds, localOffset(seconds)};
   return known.offset;
