@@ -140,7 +140,7 @@ TEST(Server, FailsADumpForWhichThereIsNoThread) {
   pthread_getattr_default_np(&before);
   pthread_attr_t huge{};
   pthread_attr_init(&huge);
-  pthread_attr_setstacksize(&huge, std::size_t{1} << 46);
+  pthread_attr_setstacksize(&huge, ~std::size_t{0xFFFFFFF});  // of any width, nearly all memory
   ASSERT_EQ(pthread_setattr_default_np(&huge), 0);
   zub::client::PerformCommand(manager, zub::kCommandTraceDumpState,
                               [&code, member = dispatch::membership(group)](
