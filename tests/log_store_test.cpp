@@ -437,7 +437,7 @@ TEST_F(Journal, OutlivesFilesThatAreTruncatedWhileTheyAreRead) {
   for (int i = 0; i < 20; ++i) {
     std::filesystem::copy_file(kept, file, std::filesystem::copy_options::overwrite_existing);
     const std::size_t moment = 1 + random() % 3'000;
-    const std::size_t size = random() % std::filesystem::file_size(kept);
+    const std::uintmax_t size = random() % std::filesystem::file_size(kept);
     const auto truncate = [&](std::size_t number) {
       if (number == moment) std::filesystem::resize_file(file, size);
     };
