@@ -61,7 +61,7 @@ extern "C" void onEndingSignal(int signal) {
   giveUp();
   std::size_t index = 0;
   while (kEnding[index] != signal) ++index;
-  struct sigaction own {};
+  struct sigaction own = {};
   sigaction(signal, &gEndingBefore[index], &own);
   sigset_t only;
   sigemptyset(&only);
@@ -69,7 +69,6 @@ extern "C" void onEndingSignal(int signal) {
   raise(signal);
   pthread_sigmask(SIG_UNBLOCK, &only, nullptr);  // here it ends, or stops and goes on
   sigaction(signal, &own, nullptr);
-  gWasContinued = true;
   gIsGivenUp = false;
   wakeEditor();
   errno = errorBefore;
@@ -96,7 +95,7 @@ void becomeBusy() {
 template <std::size_t N>
 void handle(const std::array<int, N>& signals, void (*handler)(int),
             std::array<struct sigaction, N>& before) {
-  struct sigaction action {};
+  struct sigaction action = {};
   action.sa_handler = handler;
   action.sa_flags = SA_RESTART;
   for (std::size_t i = 0; i < N; ++i) {
@@ -155,14 +154,15 @@ TerminalSession::Event TerminalSession::wait(int milliseconds) {
     const int ready = ppoll(&input, 1, milliseconds < 0 ? nullptr : &limit, &signalsBefore);
     becomeBusy();
     const bool wasResized = gWasResized.exchange(false);
-    if (gWasContinued.exchange(false)) {
+    const bool wasContinued = gWasContinued.exchange(false);
+    if (wasContinued || !gIsEditing) {
       termios now{};
       readSettings(now);
       if ((now.c_lflag & ICANON) != 0) gBefore = now;
       apply(TCSADRAIN, gEditing);
       gIsEditing = true;
-      return Event::continued;
     }
+    if (wasContinued) return Event::continued;
     if (wasResized) return Event::resized;
     if (ready > 0) return Event::input;
     if (ready == 0) return Event::timeout;
