@@ -176,7 +176,8 @@ TEST_F(Terminal, IsDrawnAnewWhenItsSizeChanges) {
   ioctl(program->terminal(), TIOCSWINSZ, &size);
   read(kPrompt);
   program->type("r\001logdump \t\r");
-  read(kPrompt, 2);
+  read(kPath);  // after the line has perhaps been drawn twice
+  read(kPrompt);
   EXPECT_EQ(shown(printed, 30), kPrompt + kTel + reason +
                                     "\nbb     cd     core   help\n... 2 more\n" +
                                     shownFor(kTel + reason) + kAtTheEnd);
@@ -194,7 +195,7 @@ TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
   program->type("\n");
   read("rz");
   program->type("b\r");
-  read(kPath);  // after the line has perhaps been drawn twice
+  read(kPath);  // likewise
   read(kPrompt);
   EXPECT_EQ(shown(printed), kPrompt + line + "\nstopped\n" + shownFor(line + 'b') + kAtTheEnd);
 }
