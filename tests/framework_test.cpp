@@ -16,15 +16,12 @@ namespace {
 
 using Words = std::list<std::string>;
 
-/// What the program reads on standard input while this lives.
-struct TypedInput : std::stringbuf {
-  explicit TypedInput(const std::string& text)
-      : std::stringbuf(text), before(std::cin.rdbuf(this)) {
-    std::cin.clear();
-  }
-  ~TypedInput() override { std::cin.rdbuf(before); }
-  std::streambuf* before;
-};
+/// Makes `text` what the program reads on standard input.
+void typeIn(const std::string& text) {
+  static std::stringbuf typed;
+  typed.str(text);
+  std::cin.rdbuf(&typed);
+}
 
 /// A node that says on standard output what is asked of it: "?name" for permission, which it
 /// refuses for names with "no" in front, and "path:handler(words)" for a run.
@@ -105,7 +102,7 @@ TEST(Shell, RunsCommandLinesAndTypedLines) {
     const bool isTyped = table == "shell-lines";
     forEachRow(table, 3, [isTyped](const Row& row) {
       const CapturedOutput out;
-      const TypedInput in(isTyped ? row[0] : "");
+      typeIn(isTyped ? row[0] : "");
       EXPECT_EQ(TestShell().run(commandLine(isTyped ? "" : row[0])), row[2] == "true");
       EXPECT_EQ(out.str(), row[1]);
     });
@@ -131,7 +128,7 @@ TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
   EXPECT_EQ(out.str(), "");
 }
 
-TEST(Shell, ReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
+TEST(Shell, NeedsATreeAndReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
   std::vector<std::optional<bool>> answers = {true, std::nullopt, false};
   TestShell shell([&](const std::string& prompt, const auto& complete, std::string& line) {
     std::cout << prompt << complete("a").front() << ' ';
@@ -141,27 +138,20 @@ TEST(Shell, ReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
     return answer;
   });
   const CapturedOutput out;
-  const TypedInput in("a\n");
+  typeIn("a\n");
+  shell.hasTree = false;
   EXPECT_FALSE(shell.run({"r"}));
+  EXPECT_EQ(out.str(), "");
+  shell.hasTree = true;
+  EXPECT_FALSE(shell.run({})) << "it needs no program name";
   EXPECT_EQ(out.str(), "$(/r)>> a $(/r/s)>> a (/r/s)>> $$?a /r/s:a() $(/r/s)>> a ");
 }
 
-TEST(Shell, NeedsATreeButNoProgramName) {
-  const CapturedOutput out;
-  const TypedInput in("quit\n");
-  TestShell treeless;
-  treeless.hasTree = false;
-  EXPECT_FALSE(treeless.run({"r"}));
-  EXPECT_EQ(out.str(), "");
-  EXPECT_TRUE(TestShell().run({}));
-  EXPECT_EQ(out.str(), "(/r)>> $$");
-}
-
-TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
+TEST(Command, ShowsItsTablesInTheirOwnOrderFlushesEachLineAndRunsWhatIsInThem) {
   const auto root = Node::create("root", {}, [](Node& node) {
-    node.handler("b", true, "earlier");
-    node.handler("b", true, "[x|y] does b");
-    node.handler("b", false);  // an empty help keeps the one before
+    node.handler("b", false, "earlier");
+    node.handler("b", false, "[x|y] does b");
+    node.handler("b");  // an empty help keeps the one before
     node.addCommandHandler("null", {}, "help of nothing");
     node.handler("exactly16letters");
     node.handler("seventeen-letters");
@@ -178,24 +168,8 @@ TEST(Help, ShowsTablesInTheirOwnOrderAndFlushesEachLine) {
   const CapturedOutput out;
   root->CommandBase::displayHelp();
   forEachRow("help", 1, [&out](const Row& row) { EXPECT_EQ(out.str(), row[0]); });
-}
-
-TEST(Command, LooksUpWhatHasBeenRegistered) {
-  const auto node = Node::create("r", std::shared_ptr<CommandBase>(), [](Node& self) {
-    self.addCommandHandler("null", std::function<bool(dispatch::group, Words)>(), "");
-    self.handler("h", false);
-    self.handler("h", true);
-    self.child("c", [](Node&) {});
-  });
-  EXPECT_FALSE(node->isValidCommand("null"));
-  EXPECT_EQ(node->getSubCommandObj("d"), nullptr);
-  EXPECT_FALSE(node->isValidSubCommand("d"));
-  EXPECT_EQ(node->getSubCommandObj("c")->getHierarchy(), "/r/c");
-  const CapturedOutput out;
-  EXPECT_TRUE(node->execCommand("h", {"last", "first"}));
-  EXPECT_FALSE(node->execCommand("d", {}));
-  EXPECT_FALSE(node->isValidCommand("d"));
-  EXPECT_EQ(out.str(), "/r:h(<first><last>) ");
+  EXPECT_TRUE(root->execCommand("b", {}));
+  EXPECT_FALSE(root->execCommand("null", {}) || root->execCommand("none", {}));
 }
 
 }  // namespace
