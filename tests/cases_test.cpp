@@ -57,8 +57,7 @@ class CaseFile {
     auto& [name, first, device, start, expected] = cases.back();
     if (key == "device") return static_cast<void>(device[splitAt(" =", text).first] = text);
     if (key == "not") return replace(text);
-    if (key == "word" || key == "words") return addWords(start.words, text, key == "word");
-    if (key == "terminal") return static_cast<void>(start.onTerminal = true);
+    if (key == "words") return setWords(start.words, escaped);
     if (key == "name") return static_cast<void>(start.name = text);
     if (key == "status") return static_cast<void>(expected.status = std::stoi(text));
     if (key == "help") return addText("out+", unescaped(readFile(kFolder + text + ".help")));
@@ -72,14 +71,13 @@ class CaseFile {
     cases.push_back(base.empty() ? Case() : Case(*above));
     cases.back().name = name;
     cases.back().line = number;
-    inherited = {"words", "in", "out", "err", "request"};
+    inherited = {"in", "out", "err", "request"};
   }
 
-  void addWords(std::vector<std::string>& words, const std::string& text, bool isOne) {
-    if (inherited.erase("words") > 0) words.clear();
-    if (isOne) return words.push_back(text);
-    std::istringstream stream(text);
-    for (std::string word; stream >> word;) words.push_back(word);
+  static void setWords(std::vector<std::string>& words, const std::string& escaped) {
+    words.clear();
+    std::istringstream stream(escaped);
+    for (std::string word; stream >> word;) words.push_back(word == "''" ? "" : unescaped(word));
   }
 
   void addText(std::string key, const std::string& text) {
