@@ -15,16 +15,12 @@ struct {
 } device;
 
 TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
-  const struct {
-    int radio;
-    std::string running, asked;
-  } cases[] = {{0, "Orvalind", "radio "},
-               {1, "Orvalind", "radio Orvalind product "},
-               {1, "modemd", "radio Orvalind product modemd "}};
-  for (const auto& one : cases) {
-    device = {one.radio, 0, one.running, ""};
-    EXPECT_EQ(WhyNotToStart() == nullptr, one.radio == 1) << one.asked;
-    EXPECT_EQ(device.asked, one.asked);
+  for (const auto& [radio, running, asked] : {std::tuple(0, "Orvalind", "radio "),
+                                              {1, "Orvalind", "radio Orvalind product "},
+                                              {1, "modemd", "radio Orvalind product modemd "}}) {
+    device = {radio, 0, running, ""};
+    EXPECT_EQ(WhyNotToStart() == nullptr, radio == 1) << asked;
+    EXPECT_EQ(device.asked, asked);
   }
   for (int product = 0; product < 60; ++product) {
     device = {1, product, "", ""};
