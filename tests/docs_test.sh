@@ -18,26 +18,6 @@ check_same() {  # WHAT EXPECTED ACTUAL: two sets of lines
   failed=1
 }
 
-# Words that the tree takes after others: handlers after "zubtool logdump", options after
-# "zubtool logdump tel".
-declare -A tree
-
-read_tree() {
-  local help command handler text
-  help=$("$program" help)
-  tree[zubtool]=$(find_all '^\t +\K\S+' <<<"$help")$'\nexit'  # which the help does not show
-  tree[zubtool cd]=$(find_all '^\t +\K\S+(?=  -  \[)' <<<"$help")
-  for command in ${tree[zubtool cd]}; do
-    help=$("$program" "$command" help)
-    tree[zubtool $command]=$(find_all '^\t +\K\S+(?=  -  [^<])' <<<"$help")
-    for handler in ${tree[zubtool $command]}; do
-      text=$(find_all "^\t +\Q$handler\E  -  \K.*" <<<"$help")
-      tree[zubtool $command $handler]=$(find_all '[[|]\K[a-z.]+(?=[]|])| \K-[a-z](?= )' <<<"$text")
-    done
-    tree[zubtool $command]+=$'\nhelp'
-  done
-}
-
 # Prints what the completion for a shell offers behind words, one a line.
 offers_of_bash() (
   trap - ERR  # to offer nothing is no fault
@@ -62,25 +42,35 @@ check_offer() {  # SHELL LINE EXPECTED
   check_same "$1 should offer other words (<) after '$2' than it does (>)" "$3" "$("offers_of_$1" $2)"
 }
 
-check_completion() {  # SHELL
-  local path line words
+# Words that the tree takes after others: handlers after "zubtool logdump", options after
+# "zubtool logdump tel".
+declare -A tree
+help=$("$program" help)
+tree[zubtool]=$(find_all '^\t +\K\S+' <<<"$help")$'\nexit'  # which the help does not show
+tree[zubtool cd]=$(find_all '^\t +\K\S+(?=  -  \[)' <<<"$help")
+for command in ${tree[zubtool cd]}; do
+  help=$("$program" "$command" help)
+  tree[zubtool $command]=$(find_all '^\t +\K\S+(?=  -  [^<])' <<<"$help")
+  for handler in ${tree[zubtool $command]}; do
+    text=$(find_all "^\t +\Q$handler\E  -  \K.*" <<<"$help")
+    tree[zubtool $command $handler]=$(find_all '[[|]\K[a-z.]+(?=[]|])| \K-[a-z](?= )' <<<"$text")
+  done
+  tree[zubtool $command]+=$'\nhelp'
+done
+
+for shell in bash zsh fish; do
+  command -v "$shell" >/dev/null || { echo "not run: the completion for $shell: it is not installed"; continue; }
   for path in "${!tree[@]}"; do
     line=$path
     words=${tree[$path]}
     if grep -qx -e -p <<<"$words"; then line+=' 600 out.txt'; fi
     if [[ $path == *' '*' '* ]]; then words+=$'\n--'; fi
-    check_offer "$1" "$line" "$words"
+    check_offer "$shell" "$line" "$words"
   done
-  check_offer "$1" 'zubtool logdump bb NONUI Tar tar.gz nocompress' "${tree[zubtool logdump bb]-}"$'\n--'
-  check_offer "$1" 'zubtool logdump tel why' '--'
-  check_offer "$1" 'zubtool logdump oslog 600 out.txt -p a -i' ''
-  check_offer "$1" 'zubtool logdump tel -- cd' "${tree[zubtool cd]}"
-}
-
-read_tree
-for shell in bash zsh fish; do
-  command -v "$shell" >/dev/null || { echo "not run: the completion for $shell: it is not installed"; continue; }
-  check_completion "$shell"
+  check_offer "$shell" 'zubtool logdump bb NONUI Tar tar.gz nocompress' "${tree[zubtool logdump bb]-}"$'\n--'
+  check_offer "$shell" 'zubtool logdump tel why' '--'
+  check_offer "$shell" 'zubtool logdump oslog 600 out.txt -p a -i' ''
+  check_offer "$shell" 'zubtool logdump tel -- cd' "${tree[zubtool cd]}"
 done
 named=$(find_all '\b(Ic|Cm) \K\S+|\bFl \K[a-z]' <../docs/zubtool.1 | sed 's/^.$/-&/')
 check_same 'zubtool(1) should name other words (<) than it does (>)' "$(printf '%s\n' "${tree[@]}")" "$named"

@@ -30,16 +30,6 @@ check_files() {  # ROOT
   done
 }
 
-# The program must live without the build folder.
-check_program() {  # ROOT
-  local program=$1/usr/bin/zubtool status=0 message
-  ! grep -aqF -e "$build" -e "$sources" "$program" || fail "$program names the build's folders"
-  message=$(env -i ZUB_DEVICE="$1/usr/share/zubtool/devices/server-down.device" \
-    "$program" logdump tel 2>&1) || status=$?
-  [[ $status == 1 && $message == "Server is not running."* ]] ||
-    fail "with an installed profile: status $status, and: $message"
-}
-
 # An installation is noted in the build folder, where root may have left notes before: here in one
 # of its own, which has nothing but the folder's instructions.
 mkdir instructions
@@ -52,7 +42,14 @@ check_files installed
 DESTDIR=$scratch/other cmake --install instructions --prefix /opt/z >log 2>&1
 zcat other/opt/z/share/man/man1/zubtool.1.gz | grep -q '^.It Pa /opt/z/share/zubtool/devices/' ||
   fail "zubtool(1) does not name the folder that it was installed to"
-check_program "$scratch/installed"
+
+# The program must live without the build folder.
+program=installed/usr/bin/zubtool status=0
+! grep -aqF -e "$build" -e "$sources" "$program" || fail "$program names the build's folders"
+message=$(env -i ZUB_DEVICE=installed/usr/share/zubtool/devices/server-down.device \
+  "$program" logdump tel 2>&1) || status=$?
+[[ $status == 1 && $message == "Server is not running."* ]] ||
+  fail "with an installed profile: status $status, and: $message"
 
 command -v dpkg-shlibdeps >/dev/null ||
   { echo "not run: the package: dpkg-deb or dpkg-shlibdeps is not installed"; exit 0; }

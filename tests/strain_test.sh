@@ -18,8 +18,9 @@ expect_status() {  # STATUS WHAT COMMAND ...: what it prints is of no interest
 }
 
 # The program prints the same in each round of a long run, and holds no more memory in the end.
-soak() {
-  local commands=$'logdump tel r\nlogdump core\nbogus -- help\nlogdump bb tar' rounds=1500 round printed memory=()
+(
+  commands=$'logdump tel r\nlogdump core\nbogus -- help\nlogdump bb tar'
+  rounds=1500 memory=()
   echo 'dump-timestamp = T' >device
   export ZUB_DEVICE=device
   round=$("$program" <<<"$commands" || true)
@@ -36,9 +37,7 @@ soak() {
   exec {COPROC[1]}>&-
   wait "$COPROC_PID" && fail "the end of its input is no failure"
   [ ! -s err ] || fail "the long run complains: $(head -n 3 err)"
-}
-
-(soak)
+)
 
 head -c $((1 << 20)) /dev/zero | tr '\0' '\n' >largest
 expect_status 0 "the largest profile" env ZUB_DEVICE=largest "$program" help
