@@ -115,7 +115,6 @@ TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
     node.handler("opt", true, "[fast|slow|tar.gz] <why> does [it]");
     node.handler("out", true, "[how many] [output file path] -p <a b..> -i <c> writes -x");
   });
-  const auto before = std::filesystem::current_path();
   std::filesystem::current_path(ZUBTOOL_SOURCES "/tests/tables");
   const CapturedOutput out;
   forEachRow("completion", 2, [&root](const Row& row) {
@@ -124,7 +123,6 @@ TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
       offered += (offered.empty() ? "" : " ") + word;
     EXPECT_EQ(offered, row[1] == " " ? "" : row[1]);
   });
-  std::filesystem::current_path(before);
   EXPECT_EQ(out.str(), "");
 }
 

@@ -285,14 +285,13 @@ TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
   events[0].message.assign(1 << 20, 'x');
   EXPECT_FALSE(put(300ms));
   fcntl(reader, F_SETFL, 0);
-  std::string text(4, ' ');
-  EXPECT_EQ(read(reader, text.data(), 4), 4);
-  EXPECT_EQ(text, "1970");
+  std::string text;
   char piece[65536];
   ssize_t length = 0;
   while ((length = read(reader, piece, sizeof piece)) > 0) {
     text.append(piece, static_cast<std::size_t>(length));
   }
+  EXPECT_TRUE(text.starts_with("1970"));
   EXPECT_EQ(std::ranges::count(text, '\n'), 1) << "the line under way, and none behind it";
   close(reader);
 }
