@@ -145,7 +145,7 @@ TEST(Shell, NeedsATreeAndReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) 
   EXPECT_EQ(out.str(), "$(/r)>> a $(/r/s)>> a (/r/s)>> $$?a /r/s:a() $(/r/s)>> a ");
 }
 
-TEST(Command, ShowsItsTablesInTheirOwnOrderFlushesEachLineAndRunsWhatIsInThem) {
+TEST(Command, ShowsItsTablesInOrderAndRunsWhatIsInThem) {
   const auto root = Node::create("root", {}, [](Node& node) {
     node.handler("b", false, "earlier");
     node.handler("b", false, "[x|y] does b");

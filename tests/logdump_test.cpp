@@ -52,8 +52,7 @@ TEST(ZUBCommand, SharesItsConnectionFlushesEachLineAndGivesAllBack) {
   {
     const dispatch::queue queue("tree");
     queue.async([member = dispatch::membership(queueThread)] {
-      const thread_local dispatch::membership untilTheThreadEnds(member);
-      static_cast<void>(untilTheThreadEnds);
+      [[maybe_unused]] const thread_local dispatch::membership untilTheThreadEnds(member);
     });
     const auto own = zub::client::CreateManager("test", queue);
     manager = own;

@@ -245,7 +245,6 @@ TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
   EXPECT_TRUE(put()) << "the log store ended the stream, for whatever reason";
   EXPECT_EQ(diagnostics(), Texts{"Invalid oslog stream: reason = 7"});
   thread.join();
-  calls.clear();
   events.resize(3);
   for (const auto& [path, message, why] :
        {std::array{"/dev/full", "m", "No space left on device"},

@@ -59,7 +59,7 @@ class LogStore : public testing::Test {
   std::shared_ptr<OSLogEventStream> stream;
 };
 
-TEST_F(LogStore, DeliversTheEventsInTheirOrderFromTheDateOnThatAnyTermOfTheFilterLetsPass) {
+TEST_F(LogStore, DeliversInOrderFromTheDateOnWhatAnyTermOfTheFilterLetsPass) {
   auto all = run(tenMinutesAgo);
   if (all.empty()) GTEST_SKIP() << "nothing has been logged for ten minutes";
   const auto wanted = all.back().process;
@@ -82,7 +82,7 @@ TEST_F(LogStore, DeliversTheEventsInTheirOrderFromTheDateOnThatAnyTermOfTheFilte
   EXPECT_THROW(stream->setFilterPredicate({{{"pid == %@", "1"}}}), std::invalid_argument);
 }
 
-TEST_F(LogStore, IsInvalidatedFromAnywhereAndRunsToItsEndWhenItsMakerReleasesIt) {
+TEST_F(LogStore, IsInvalidatedFromAnywhereAndRunsOnWhenItsMakerReleasesIt) {
   run(tenMinutesAgo, [this] { stream->invalidate(); });  // from its own thread, again and again
   stream->invalidate();                                  // after its end
   renew();
