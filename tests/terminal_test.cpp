@@ -50,7 +50,7 @@ std::string shown(const std::string& bytes, std::size_t columns = 80) {
   std::string text;
   for (std::size_t i = 0; i < cells.size(); i += columns) {
     text += cells.substr(i, columns);
-    if (text.back() == ' ') text.replace(text.find_last_not_of(' ') + 1, columns, "\n");
+    if (text.back() == ' ') text = text.substr(0, text.find_last_not_of(' ') + 1) + '\n';
   }
   return text.substr(0, text.find_last_not_of('\n') + 1);
 }
