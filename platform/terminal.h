@@ -14,7 +14,7 @@ using LineCompleter = std::function<std::vector<std::string>(const std::string& 
 
 /// Shows `prompt` on the terminal and has a person edit a line there, with keys to move about, a
 /// history of the lines before, and `complete` for Tab. Leaves the line in `line`, without its line
-/// end, each byte as it was typed.
+/// end, each byte as it was typed; a NUL is a key without use.
 ///
 /// True for a line; false when the input has ended. Nothing, with nothing shown or read, when there
 /// is no terminal to edit on: standard input or standard output is none, TERM is not set, not known
@@ -22,8 +22,9 @@ using LineCompleter = std::function<std::vector<std::string>(const std::string& 
 ///
 /// The terminal's settings are other than before while this waits for keys, and at no other time:
 /// they are back before it returns, and however the process ends or stops meanwhile, save by a
-/// signal that no program can handle. Signals do what they do without it. What standard output was
-/// given before must have been flushed. Threads: one, any; `complete` runs on it.
+/// signal that no program can handle, a fault of its own, or a timer of a profiler. Signals do what
+/// they do without it. What standard output was given before must have been flushed. Threads: one,
+/// any; `complete` runs on it.
 std::optional<bool> readEditedLine(const std::string& prompt, const LineCompleter& complete,
                                    std::string& line);
 

@@ -91,10 +91,12 @@ void Program::execute(const Start& start, int input, int output) const {
 }
 
 termios Program::terminalBefore() {
-  termios plain{};  // no echo, no translation of line ends: the output is the program's own
-  cfmakeraw(&plain);
+  termios plain{};
+  const int terminal = posix_openpt(O_NOCTTY | O_CLOEXEC);
+  tcgetattr(terminal, &plain);
+  close(terminal);
+  cfmakeraw(&plain);  // no echo, no translation of line ends: the output is the program's own
   plain.c_lflag |= ICANON | ISIG;
-  plain.c_cc[VSUSP] = '\x1A';
   return plain;
 }
 

@@ -116,17 +116,17 @@ TEST_F(Terminal, EditsLinesAndRunsWhatTheyBecome) {
     int prompts = 1;         // that show after the keys
     std::string above = {};  // shown besides
   } cases[] = {
-      {kTel + "ac\033[Db\r", {"abc"}},                                 // left
-      {"tel x\033[Hlogdump \r", {"x"}},                                // to the start
-      {rows + "\001" + kTel + "\r", {rows}},                           // of many rows
-      {"tel ac\033[7~logdump \033[8~\033[1;5Db\033[4~d\r", {"bacd"}},  // other terminals'
-      {"Xlogdump t e\033[1~\033[3~\033[1;5C\033[1;5Cel\r", {"e"}},     // keys
-      {kTel + "\033[2~\033[5~\033[6~\033x\033Xn\r", {"n"}},            // and without use
-      {kTel + "ef\033[D\004\r", {"e"}},                                // a character less
-      {kTel + "nonui\027\xC3\xA9\r", {"\xC3\xA9"}},                    // a word less
+      {kTel + "ac\033[1;3D\033[F\033[1;2D\033[1;2C\033[Db\r", {"abc"}},  // left
+      {"tel x\033[Hlogdump \r", {"x"}},                                  // to the start
+      {rows + "\001" + kTel + "\r", {rows}},                             // of many rows
+      {"tel ac\033[7~logdump \033[8~\033[1;5Db\033[4~d\r", {"bacd"}},    // other terminals'
+      {"Xlogdump t e\033[1~\033[3~\033[1;5C\033[1;3Cel\r", {"e"}},       // keys
+      {kTel + '\0' + "\033[2~\033[5~\033[6~\033x\033Xn\r", {"n"}},       // and without use
+      {kTel + "ef\033[D\004\r", {"e"}},                                  // a character less
+      {kTel + "nonui\027\xC3\xA9\r", {"\xC3\xA9"}},                      // a word less
       {kTel + "u\r" + kTel + "v\r" + kTel + "v\r\033[A\033[Aw\r", {"u", "v", "v", "uw"}, 4},
       {" \r\033[A2\r", {"uw2"}, 2, "(/zubtool)>>\n"},                    // the line before
-      {"\0222x\010\022\033[D\r", {rows}},                                // a search
+      {"\022~\007\033[D\0222x\010\022\033[D\r", {rows}},                 // a search
       {kTel + "a\rlogdump tel b\r", {"a", "b"}, 2},                      // a paste
       {"lo\tt\tq\r", {"q"}},                                             // sub-command, handler
       {"logdump \ttel d\r", {"d"}, 2, kPrompt + "logdump\n" + offered},  // a list
@@ -201,7 +201,7 @@ TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
 }
 
 TEST_F(Terminal, IsAsItWasHoweverTheProgramEnds) {
-  for (const int signal : {0, SIGINT, SIGTERM, SIGHUP, SIGQUIT}) {
+  for (const int signal : {0, SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGUSR1, SIGXCPU}) {
     const int terminal = dup(program->terminal());
     for (const int waking : {SIGWINCH, SIGCONT}) kill(program->pid(), waking);
     signal == 0 ? program->type("quit\r") : static_cast<void>(kill(program->pid(), signal));

@@ -14,7 +14,8 @@
 namespace host {
 namespace {
 
-constexpr std::array kEnding = {SIGHUP, SIGINT, SIGQUIT, SIGTERM, SIGABRT, SIGTSTP};
+constexpr std::array kEnding = {SIGHUP,  SIGINT,  SIGQUIT, SIGTERM, SIGABRT,
+                                SIGTSTP, SIGALRM, SIGUSR1, SIGUSR2, SIGXCPU};
 constexpr std::array kWaking = {SIGCONT, SIGWINCH};
 
 // Signal handlers have no other way to what they need.

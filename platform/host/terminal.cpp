@@ -41,9 +41,11 @@ constexpr struct {
     {L"\\e[1;5D", L"ed-prev-word"},  {L"\\e[1~", L"ed-move-to-beg"},
     {L"\\e[7~", L"ed-move-to-beg"},  {L"\\e[4~", L"ed-move-to-end"},
     {L"\\e[8~", L"ed-move-to-end"},  {L"\\e[3~", L"ed-delete-next-char"},
+    {L"\\e[1;3C", L"em-next-word"},  {L"\\e[1;3D", L"ed-prev-word"},
+    {L"\\e[1;2C", L"ed-next-char"},  {L"\\e[1;2D", L"ed-prev-char"},
     {L"\\e[2~", L"ed-unassigned"},   {L"\\e[5~", L"ed-unassigned"},
     {L"\\e[6~", L"ed-unassigned"},   {L"\\ex", L"ed-unassigned"},
-    {L"\\eX", L"ed-unassigned"},
+    {L"\\eX", L"ed-unassigned"},     {L"^@", L"ed-unassigned"},
 };
 
 /// Gives the calling thread the character types of UTF-8 while this lives. What is printable and
@@ -297,6 +299,7 @@ unsigned char Editor::search() {
 /// its own, which ends the search; then another one has to start the sequence.
 void Editor::followSearch() {
   constexpr wchar_t kEscape = L'\033';
+  constexpr wchar_t kCtrlG = L'\a';
   constexpr std::wstring_view kGoOn = L"\x08\x7F\x17";  // Ctrl-H, Delete, Ctrl-W
   wchar_t& next = received.front();
   if (next == kCtrlR) {
@@ -304,6 +307,9 @@ void Editor::followSearch() {
   } else if (next == kEscape) {
     isSearching = false;
     if (waitForInput(kRestOfSequence) == TerminalSession::Event::input) received += kEscape;
+  } else if (next == kCtrlG) {
+    isSearching = false;
+    received += kCtrlG;  // where nothing was found, the first only takes back what was not
   } else if (next < L' ' && kGoOn.find(next) == std::wstring_view::npos) {
     isSearching = false;
   }
