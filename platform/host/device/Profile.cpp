@@ -265,6 +265,12 @@ std::string readLine(std::string_view line, Profile& profile,
 
 }  // namespace
 
+std::vector<std::string_view> profileKeys() {
+  std::vector<std::string_view> names;
+  for (const Key& key : kKeys) names.push_back(key.name);
+  return names;
+}
+
 std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
                                         Profile& profile) {
   constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";

@@ -67,6 +67,9 @@ struct Profile {
   friend bool operator==(const Profile&, const Profile&) = default;
 };
 
+/// The keys that a profile may set.
+std::vector<std::string_view> profileKeys();
+
 /// Reads the text of a profile into `profile`, which keeps its defaults for keys that are not set.
 /// `file` is the profile's path, for messages and for the paths it takes from its own folder.
 /// Returns what is wrong as "FILE:LINE: what", or nothing when the profile is good.
