@@ -74,12 +74,15 @@ set(CPACK_DEBIAN_PACKAGE_MAINTAINER "${contact}")
 set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
 set(CPACK_DEBIAN_PACKAGE_SECTION utils)
 set(CPACK_DEBIAN_PACKAGE_PRIORITY optional)
-set(CPACK_DEBIAN_PACKAGE_RECOMMENDS "libedit2, libsystemd0")  # opened at their first use
+get_property(opened GLOBAL PROPERTY zub_opened_packages)
+list(JOIN opened ", " CPACK_DEBIAN_PACKAGE_RECOMMENDS)
 set(CPACK_PACKAGE_DESCRIPTION
     "zubtool asks the baseband manager server to collect telephony logs,
 telephony logs with a core dump of the modem, or baseband traces, and
 prints where they are. It also exports the recent system log of chosen
-processes into a text file.
+processes into a text file.")
+if(platform STREQUAL host)
+  string(APPEND CPACK_PACKAGE_DESCRIPTION "
 .
 On an ordinary Linux machine there is no such device. The tool then plays
 one: it says Success and a path that does not exist, and exports invented
@@ -87,5 +90,6 @@ lines. A device profile, named by the environment variable ZUB_DEVICE,
 makes the export real: /usr/share/zubtool/devices/host.device for the
 journal of this machine, or a file with the line 'log = FILE' for a log
 from elsewhere.")
+endif()
 set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 include(CPack)
