@@ -24,10 +24,9 @@ check_files() {  # ROOT
   diff <(sort -k 2 <<<"$expected") <(cd "$1" && find usr -type f -printf '%m %p\n' | sort -k 2) >&2 ||
     fail "$1 does not hold the files it should (<), but others (>)"
   ! find "$1/usr" -type d ! -perm 755 -printf '%m %p\n' | grep . >&2 || fail "$1 has such folders"
-  for page in "$1"/usr/share/man/*/*.gz; do
-    gzip -t "$page"
-    ! command -v mandoc >/dev/null || mandoc -T lint -W warning "$page" || fail "$page has faults"
-  done
+  gzip -t "$1"/usr/share/man/*/*.gz
+  command -v mandoc >/dev/null || { echo "not run: lint of the manual pages: mandoc is not installed"; return; }
+  printf '%s\n' "$1"/usr/share/man/*/*.gz | xargs -n 1 mandoc -T lint -W warning || fail "faults in manual pages"
 }
 
 # An installation is noted in the build folder, where root may have left notes before: here in one
@@ -51,8 +50,8 @@ message=$(env -i ZUB_DEVICE=installed/usr/share/zubtool/devices/server-down.devi
 [[ $status == 1 && $message == "Server is not running."* ]] ||
   fail "with an installed profile: status $status, and: $message"
 
-command -v dpkg-shlibdeps >/dev/null ||
-  { echo "not run: the package: dpkg-deb or dpkg-shlibdeps is not installed"; exit 0; }
+command -v dpkg-shlibdeps >/dev/null && command -v file >/dev/null ||
+  { echo "not run: the package: dpkg-dev or file is not installed"; exit 0; }
 umask 077  # of no matter to what is in a package
 cpack -G DEB --config "$build/CPackConfig.cmake" \
   -D "CPACK_INSTALL_CMAKE_PROJECTS=$scratch/instructions;zubtool;ALL;/" -B "$scratch/package" >log 2>&1 ||
