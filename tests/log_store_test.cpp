@@ -64,7 +64,7 @@ struct Pieces final : host::ByteSource {
   std::size_t piece;
 };
 
-/// The messages of a log, and behind them how it ends.
+/// The messages of a log, and after them how it ends.
 Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
   RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
   Texts seen;
@@ -250,7 +250,7 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   EXPECT_EQ(run(stream(log)).reason, 9);
   EXPECT_EQ(run(stream(write("cut", kDate))).reason, host::kStreamDamaged);
   host::device().logEnd = std::nullopt;
-  delivered = run(stream(log), 4);  // stays open behind the last event
+  delivered = run(stream(log), 4);  // stays open after the last event
   EXPECT_EQ(delivered.events.size(), 4);
   EXPECT_EQ(delivered.reason, host::kStreamInvalidated);
   EXPECT_EQ(run(stream(log), 2).events.size(), 2);

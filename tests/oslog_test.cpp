@@ -291,7 +291,7 @@ TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
     text.append(piece, static_cast<std::size_t>(length));
   }
   EXPECT_TRUE(text.starts_with("1970"));
-  EXPECT_EQ(std::ranges::count(text, '\n'), 1) << "the line under way, and none behind it";
+  EXPECT_EQ(std::ranges::count(text, '\n'), 1) << "the line under way, and none after it";
   close(reader);
 }
 

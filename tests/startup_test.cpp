@@ -14,6 +14,11 @@ struct {
   std::string asked;
 } device;
 
+int answer(const std::string& question, int with) {
+  device.asked += question + ' ';
+  return with;
+}
+
 TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
   for (const auto& [radio, running, asked] : {std::tuple(0, "Orvalind", "radio "),
                                               {1, "Orvalind", "radio Orvalind product "},
@@ -32,8 +37,8 @@ TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
 
 }  // namespace
 
-int TelephonyRadiosGetRadio() { return device.asked += "radio ", device.radio; }
-int TelephonyRadiosGetProduct() { return device.asked += "product ", device.product; }
+int TelephonyRadiosGetRadio() { return answer("radio", device.radio); }
+int TelephonyRadiosGetProduct() { return answer("product", device.product); }
 bool tlu::isProcessRunning(const std::string& name) {
-  return device.asked += name + " ", name == device.running;
+  return answer(name, name == device.running ? 1 : 0) == 1;
 }
