@@ -171,8 +171,8 @@ Editor::Editor() {
   }
   lib.el_wset(edit, EL_EDITOR, L"emacs");
   lib.el_wset(edit, EL_HIST, lib.history_w, history);
-  lib.el_wset(
-      edit, EL_PROMPT, +[](EditLine*) { return shared()->shownPrompt.data(); });
+  const auto showPrompt = +[](EditLine*) { return shared()->shownPrompt.data(); };
+  lib.el_wset(edit, EL_PROMPT, showPrompt);
   lib.el_wset(
       edit, EL_GETCFN,
       +[](EditLine*, wchar_t* character) { return shared()->readCharacter(*character); });
