@@ -21,7 +21,7 @@ constexpr std::array kWaking = {SIGCONT, SIGWINCH};
 // Signal handlers have no other way to what they need.
 termios gBefore{};                      // settings to go back to
 termios gEditing{};                     // those for editing
-pthread_t gEditor{};                    // the thread that edits
+std::atomic<pthread_t> gEditor = {};    // the thread that edits
 std::atomic<bool> gIsEditing = false;   // the settings may be other than before
 std::atomic<bool> gIsBusy = false;      // the editor may be about to change them
 std::atomic<bool> gIsGivenUp = false;   // nobody may change them: the process ends or stops
