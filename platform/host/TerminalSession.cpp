@@ -146,7 +146,7 @@ TerminalSession::~TerminalSession() {
 }
 
 TerminalSession::Event TerminalSession::wait(int milliseconds) {
-  tcgetattr(STDIN_FILENO, &gEditing);
+  if (gIsEditing) tcgetattr(STDIN_FILENO, &gEditing);
   pollfd input = {.fd = STDIN_FILENO, .events = POLLIN, .revents = 0};
   const timespec limit = {.tv_sec = milliseconds / 1000,
                           .tv_nsec = milliseconds % 1000 * 1'000'000L};
