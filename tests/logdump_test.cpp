@@ -61,8 +61,8 @@ TEST(ZUBCommand, SharesItsConnectionFlushesEachLineAndGivesAllBack) {
     EXPECT_EQ(logdump->getParent().lock(), root);
     EXPECT_EQ(manager.use_count(), 3);
     const CapturedOutput out;
-    for (const char* handler : {"tel", "core", "bb"}) {
-      EXPECT_TRUE(logdump->execCommand(handler, {}));
+    for (const std::string handler : {"tel", "core", "bb", "oslog"}) {
+      EXPECT_EQ(logdump->execCommand(handler, {"600"}), handler != "oslog");
       EXPECT_TRUE(out.str().ends_with("\n$")) << handler;
     }
     EXPECT_EQ(std::ranges::count(out.str(), '\n'), std::ranges::count(out.str(), '$'));
