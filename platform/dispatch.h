@@ -101,6 +101,7 @@ class block<Result(Arguments...)> {
 /// it is given. Threads: every member may be called from any thread, tasks included; two tasks
 /// never overlap. Lifetime: tasks already given still run after the last reference is gone; each
 /// is released before the next one starts. At process exit, tasks that have not run are dropped.
+/// Signals: the thread takes none that are sent to the process.
 /// Errors: a task must not throw; one that does ends the process. A queue whose thread cannot be
 /// started throws `std::system_error` when it is made.
 class queue {

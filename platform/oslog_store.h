@@ -110,10 +110,11 @@ inline constexpr unsigned long kOSLogEventStreamEndOfLog = 5;
 /// Delivers the events of a source. It takes its settings before it is activated, and is activated
 /// once.
 ///
-/// Threads: the two handlers run on a thread of the store's own, one call at a time. `invalidate`
-/// may be called from any thread, the handlers' included, at any time and more than once; the
-/// other members belong to the thread that made the stream. The stream may be released at any
-/// time; once activated it runs to its end all the same, or to that of the process.
+/// Threads: the two handlers run on a thread of the store's own, one call at a time; it takes no
+/// signals that are sent to the process. `invalidate` may be called from any thread, the handlers'
+/// included, at any time and more than once; the other members belong to the thread that made the
+/// stream. The stream may be released at any time; once activated it runs to its end all the same,
+/// or to that of the process.
 class OSLogEventStream {
  public:
   using EventHandler = dispatch::block<void(const OSLogEventProxy&)>;

@@ -10,6 +10,8 @@
 #include <new>
 #include <thread>
 
+#include "platform/posix/SignalsBlocked.h"
+
 namespace dispatch {
 
 struct group::State {
@@ -88,6 +90,7 @@ struct queue::Worker {
   std::shared_ptr<Tasks> tasks = std::make_shared<Tasks>();
 
   explicit Worker(const std::string& label) {
+    const posix::SignalsBlocked onTheThread;
     std::thread thread([owned = tasks] { runTasks(*owned); });
     constexpr std::size_t kLongestThreadName = 15;  // pthread_setname_np(3)
     pthread_setname_np(thread.native_handle(), label.substr(0, kLongestThreadName).c_str());

@@ -8,6 +8,8 @@
 #include <thread>
 #include <vector>
 
+#include "tests/Signals.h"
+
 using namespace std::chrono_literals;
 
 namespace {
@@ -56,6 +58,7 @@ TEST(Queue, RunsTasksInOrderAndReleasesEachBeforeTheNext) {
     }
     queue.async([&, member = dispatch::membership(group)] {
       EXPECT_EQ(owned.use_count(), 1);  // no task that has run is still held
+      EXPECT_TRUE(signalsAreBlocked());
     });
   }  // tasks given before the last reference goes still run
   group.wait();

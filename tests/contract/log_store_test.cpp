@@ -8,6 +8,7 @@
 #include <stdexcept>
 #include <thread>
 
+#include "tests/Signals.h"
 #include "tests/StreamRun.h"
 #include "tests/Table.h"
 
@@ -43,6 +44,7 @@ class LogStore : public testing::Test {
     runToItsEnd(*stream, from, [&](const OSLogEventProxy& event) {
       EXPECT_GE(event.date(), from);
       if (each) each();
+      EXPECT_TRUE(signalsAreBlocked());
       if (events.size() == kMost) return stream->invalidate();
       events.push_back(
           {event.date(), std::string(event.process()), std::string(event.composedMessage())});

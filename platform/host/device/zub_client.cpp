@@ -10,6 +10,7 @@
 #include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
 #include "platform/host/device/RequestLog.h"
+#include "platform/posix/SignalsBlocked.h"
 
 namespace zub {
 
@@ -111,6 +112,7 @@ void startServer(const std::shared_ptr<Manager>& manager) {
   for (; next != steps.end() && next->at.count() == 0; ++next) manager->enterState(next->state);
   steps.erase(steps.begin(), next);
   if (steps.empty()) return;
+  const posix::SignalsBlocked onTheThread;
   std::thread([manager, start, steps] {
     for (const auto& step : steps) {
       std::this_thread::sleep_until(start + step.at);
@@ -204,6 +206,7 @@ void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command
     complete(result, reply);
   };
   if (arrival.delay.count() == 0) return manager->queue.async(task);
+  const posix::SignalsBlocked onTheThread;
   try {
     std::thread([queue = manager->queue, delay = arrival.delay, task] {
       std::this_thread::sleep_for(delay);

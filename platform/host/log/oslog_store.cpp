@@ -15,6 +15,7 @@
 #include "platform/host/log/ReadAhead.h"
 #include "platform/host/log/StopSignal.h"
 #include "platform/host/log/StreamEnd.h"
+#include "platform/posix/SignalsBlocked.h"
 #include "platform/system.h"
 
 namespace {
@@ -113,6 +114,7 @@ class HostStream final : public OSLogEventStream {
     delivery.from = date;
     // Shared, so that it is still there when no thread can be had.
     const auto handed = std::make_shared<Delivery>(std::exchange(delivery, Delivery()));
+    const posix::SignalsBlocked onTheThread;
     try {
       std::thread([handed] { run(std::move(*handed)); }).detach();
     } catch (const std::system_error& failure) {
