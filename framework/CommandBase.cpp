@@ -1,16 +1,5 @@
 #include "framework/CommandBase.h"
 
-namespace {
-
-template <class Value>
-std::set<std::string> NamesOf(const std::map<std::string, Value>& table) {
-  std::set<std::string> names;
-  for (const auto& [name, value] : table) names.insert(name);
-  return names;
-}
-
-}  // namespace
-
 void CommandBase::init() {
   const auto above = parent.lock();
   if (above) hierarchy = above->hierarchy;
@@ -21,10 +10,11 @@ void CommandBase::init() {
 bool CommandBase::isAllowed(std::string /*name*/) { return true; }
 
 void CommandBase::addCommandHandler(const std::string& name, CommandHandler handler,
-                                    const std::string& helpText) {
+                                    const std::string& helpText, const std::string& note) {
   if (!handler) return;
   commandHandlers[name] = std::move(handler);
   if (!helpText.empty()) commandHelp[name] = helpText;
+  if (!note.empty()) commandNotes[name] = note;
 }
 
 void CommandBase::addSubCommand(const std::string& name, std::shared_ptr<CommandBase> child) {
@@ -51,13 +41,9 @@ std::shared_ptr<CommandBase> CommandBase::getNodeAt(const std::string& element) 
   return above ? above : shared_from_this();
 }
 
-std::set<std::string> CommandBase::getCommandNames() const { return NamesOf(commandHandlers); }
-
-std::set<std::string> CommandBase::getSubCommandNames() const { return NamesOf(subCommands); }
-
-std::string CommandBase::getHelpText(const std::string& name) const {
-  const auto found = commandHelp.find(name);
-  return found != commandHelp.end() ? found->second : "";
+std::string CommandBase::helpOf(const std::string& handler) const {
+  const auto found = commandHelp.find(handler);
+  return found != commandHelp.end() ? found->second : "...";
 }
 
 bool CommandBase::execCommand(const std::string& name, const std::list<std::string>& words) const {

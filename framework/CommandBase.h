@@ -3,7 +3,6 @@
 #include <list>
 #include <map>
 #include <memory>
-#include <set>
 #include <string>
 
 #include "platform/dispatch.h"
@@ -43,10 +42,11 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   /// that refuses says why before it returns false.
   virtual bool isAllowed(std::string name);
 
-  /// Registers `handler` under `name`, in place of an earlier one. An empty handler is ignored, its
-  /// help with it; an empty help text leaves an earlier text as it was.
+  /// Registers `handler` under `name`, in place of an earlier one. `note` is what a list of
+  /// completions says of it. An empty handler is ignored, with its texts; an empty text leaves an
+  /// earlier one as it was.
   void addCommandHandler(const std::string& name, CommandHandler handler,
-                         const std::string& helpText);
+                         const std::string& helpText, const std::string& note = "");
 
   /// Registers `child`, which must not be empty, under `name`, in place of an earlier one.
   void addSubCommand(const std::string& name, std::shared_ptr<CommandBase> child);
@@ -61,11 +61,23 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   /// one level up, or this one where there is none. Empty when it leads nowhere.
   std::shared_ptr<CommandBase> getNodeAt(const std::string& element);
 
-  std::set<std::string> getCommandNames() const;     ///< of the handlers
-  std::set<std::string> getSubCommandNames() const;  ///< of the children
+  /// What may stand in place of the last word of a line, each with its note, most without one.
+  using Candidates = std::map<std::string, std::string>;
 
-  /// The help text of the handler called `name`; empty where it has none.
-  std::string getHelpText(const std::string& name) const;
+  /// The candidates for the last word of `typed`, a line up to its cursor, where the prompt stands
+  /// at this node. That word is empty where `typed` ends in white space; each candidate starts with
+  /// it, but for the case of ASCII letters where case has no meaning. One that ends in "/" may go
+  /// on.
+  ///
+  /// It offers what the shell would look up there: sub-commands, handlers and the shell's own
+  /// words, and paths after "cd". After a handler it goes by the handler's help text: a bracket of
+  /// one word, "[tar|zip]", holds option words, which are read in any case; one of several words,
+  /// "[output file path]", stands for a word of its own before all options, and where it ends in
+  /// "file path" files are offered; "-p" in front of the description is an option that takes words.
+  /// "--" is offered among options. Where nothing is expected, or anything, it offers nothing.
+  ///
+  /// It asks no node for permission and runs nothing; of the system it reads folders alone.
+  Candidates complete(const std::string& typed);
 
   /// Runs the handler called `name` on this thread and returns its result, once all the work that
   /// it put on its task group has ended; there is no time-out. Without such a handler, or without
@@ -88,6 +100,9 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
 
  private:
   static void printCommandTree(const std::shared_ptr<CommandBase>& node, int depth);
+  std::string helpOf(const std::string& handler) const;
+  Candidates completeName(const std::string& start, bool isFirst) const;
+  Candidates completePath(const std::string& start);
 
   const std::weak_ptr<CommandBase> parent;
   const std::string name;
@@ -95,4 +110,5 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   std::map<std::string, CommandHandler> commandHandlers;
   std::map<std::string, std::string> commandHelp;  // only for handlers that have a help text
   std::map<std::string, std::shared_ptr<CommandBase>> subCommands;
+  std::map<std::string, std::string> commandNotes;  // only for handlers that have a note
 };

@@ -32,9 +32,7 @@ void CommandBase::displayHelp() {
   std::cout << "Options for command '" << kGreen << name << kDefaultColour << "':" << std::endl;
   std::cout << std::endl;
   for (const auto& [handler, callable] : commandHandlers) {
-    const auto help = commandHelp.find(handler);
-    StartLine(handler) << kSeparator << (help != commandHelp.end() ? help->second : "...")
-                       << std::endl;
+    StartLine(handler) << kSeparator << helpOf(handler) << std::endl;
     std::cout << std::endl;
   }
   for (const auto& [word, child] : subCommands) {

@@ -4,7 +4,6 @@
 #include <limits>
 #include <new>
 
-#include "framework/Completion.h"
 #include "framework/WordList.h"
 
 namespace {
@@ -58,7 +57,7 @@ bool CommandShell::readLine(std::string& line) const {
   if (readEdited) {
     std::cout << std::flush;
     const auto complete = [this](const std::string& typed) {
-      return CompleteLine(promptCommand, typed);
+      return promptCommand->complete(typed);
     };
     if (const auto isLine = readEdited(prompt, complete, line)) return *isLine;
   }

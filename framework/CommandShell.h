@@ -5,7 +5,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <vector>
 
 #include "framework/CommandBase.h"
 
@@ -17,8 +16,8 @@
 /// lines that a person edits.
 class CommandShell {
  public:
-  /// What may stand in place of the last word of a line up to its cursor (see Completion.h).
-  using Completer = std::function<std::vector<std::string>(const std::string& typed)>;
+  /// As `CommandBase::complete`, of the node where the prompt stands.
+  using Completer = std::function<CommandBase::Candidates(const std::string& typed)>;
 
   /// Shows the prompt and has a person edit a line, which it leaves, without its line end, in the
   /// empty `line`. True for a line, false when the input has ended; nothing, before it has shown or

@@ -28,9 +28,9 @@ bool LogdumpCommand::isAllowed(std::string name) {
 void LogdumpCommand::registerCommands() {
   addCommandHandler("tel", TelephonyLogsHandler(*this),
                     "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs");
-  addCommandHandler(
-      "core", TelephonyLogsWithCoredumpHandler(*this),
-      "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs with coredump");
+  addCommandHandler("core", TelephonyLogsWithCoredumpHandler(*this),
+                    "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs with coredump",
+                    "resets the baseband");
   addCommandHandler("bb", BasebandLogsHandler(*this),
                     "[nocompress|tar.gz|tar] <reason> collect baseband logs only");
   addCommandHandler("oslog", OsLogHandler(),

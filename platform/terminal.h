@@ -1,16 +1,17 @@
 #pragma once
 
 #include <functional>
+#include <map>
 #include <optional>
 #include <string>
-#include <vector>
 
 namespace platform {
 
-/// What may stand in place of the last word of `typed`, a line up to its cursor: words that start
-/// with that word, which is empty where `typed` ends in white space. One that ends in "/" may go
-/// on; after any other comes a blank.
-using LineCompleter = std::function<std::vector<std::string>(const std::string& typed)>;
+/// What may stand in place of the last word of `typed`, a line up to its cursor. That word is empty
+/// where `typed` ends in white space; each candidate starts with it, but perhaps for the case of
+/// ASCII letters. One that ends in "/" may go on; after any other comes a blank. Each comes with a
+/// note to show beside it in a list, which may be empty.
+using LineCompleter = std::function<std::map<std::string, std::string>(const std::string& typed)>;
 
 /// Shows `prompt` on the terminal and has a person edit a line there, with keys to move about, a
 /// history of the lines before, and `complete` for Tab. Leaves the line in `line`, without its line

@@ -7,9 +7,9 @@
 #include <sstream>
 
 #include "framework/CommandShell.h"
-#include "framework/Completion.h"
 #include "framework/WordList.h"
 #include "tests/CapturedOutput.h"
+#include "tests/Program.h"
 #include "tests/Table.h"
 
 namespace {
@@ -42,7 +42,8 @@ class Node : public CommandBase {
     return !word.starts_with("no");
   }
   void displayHelp() override { std::cout << "help " << getHierarchy() << ' '; }
-  void handler(const std::string& word, bool result = true, const std::string& help = "") {
+  void handler(const std::string& word, bool result = true, const std::string& help = "",
+               const std::string& note = "") {
     addCommandHandler(
         word,
         [this, word, result](const dispatch::group&, Words words) {
@@ -51,7 +52,7 @@ class Node : public CommandBase {
           std::cout << ") ";
           return result;
         },
-        help);
+        help, note);
   }
   void child(const std::string& word, Build buildChild) {
     addSubCommand(word, create(word, weak_from_this(), std::move(buildChild)));
@@ -112,15 +113,21 @@ TEST(Shell, RunsCommandLinesAndTypedLines) {
 TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
   const auto root = Node::create("r", {}, [](Node& node) {
     buildTree(node);
-    node.handler("opt", true, "[fast|slow|tar.gz] <why> does [it]");
+    node.handler("opt", true, "[fast|slow|tar.gz] <why> does [it]", "takes minutes");
     node.handler("out", true, "[how many] [output file path] -p <a b..> -i <c> writes -x");
   });
-  std::filesystem::current_path(ZUBTOOL_SOURCES "/tests/tables");
+  const ScratchFolder folder;
+  std::filesystem::create_directory(folder.path("logs"));
+  for (const auto* const name : {"one.txt", ".hidden", "a name", "logs/new.txt"}) {
+    writeFile(folder.path(name), "");
+  }
+  std::filesystem::current_path(folder.path(""));
   const CapturedOutput out;
   forEachRow("completion", 2, [&root](const Row& row) {
     std::string offered;
-    for (const auto& word : CompleteLine(root, row[0]))
-      offered += (offered.empty() ? "" : " ") + word;
+    for (const auto& [word, note] : root->complete(row[0])) {
+      offered += (offered.empty() ? "" : " ") + word + (note.empty() ? "" : '(' + note + ')');
+    }
     EXPECT_EQ(offered, row[1] == " " ? "" : row[1]);
   });
   EXPECT_EQ(out.str(), "");
@@ -129,7 +136,7 @@ TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
 TEST(Shell, NeedsATreeAndReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
   std::vector<std::optional<bool>> answers = {true, std::nullopt, false};
   TestShell shell([&](const std::string& prompt, const auto& complete, std::string& line) {
-    std::cout << prompt << complete("a").front() << ' ';
+    std::cout << prompt << complete("a").begin()->first << ' ';
     const auto answer = answers.front();
     answers.erase(answers.begin());
     line = answer ? "cd s" : "";

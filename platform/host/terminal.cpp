@@ -11,6 +11,7 @@
 #include <cwchar>
 #include <cwctype>
 #include <string_view>
+#include <vector>
 
 #include "platform/host/Libedit.h"
 #include "platform/host/TerminalSession.h"
@@ -89,10 +90,12 @@ winsize sizeOfTerminal() {
   return size;
 }
 
+using Candidates = std::map<std::string, std::string>;
+
 /// What `words` have in common at their start.
-std::string commonStart(const std::vector<std::string>& words) {
-  std::string common = words.front();
-  for (const auto& word : words) {
+std::string commonStart(const Candidates& words) {
+  std::string common = words.begin()->first;
+  for (const auto& [word, note] : words) {
     common.erase(std::ranges::mismatch(common, word).in1, common.end());
   }
   return common;
@@ -132,7 +135,7 @@ class Editor {
   unsigned char search();
   void followSearch();
   unsigned char completeWord();
-  unsigned char list(const std::vector<std::string>& candidates);
+  unsigned char list(const Candidates& candidates);
   Rows rowsOfLine() const;
   std::wstring toCursor() const;
   std::wstring fromCursor() const;
@@ -340,14 +343,16 @@ unsigned char Editor::completeWord() {
 }
 
 /// Lists the candidates under the line, as many as the screen holds.
-unsigned char Editor::list(const std::vector<std::string>& candidates) {
+unsigned char Editor::list(const Candidates& candidates) {
   const auto size = sizeOfTerminal();
   const auto rows = rowsOfLine();
   std::string text(rows.all - rows.toCursor + 1, '\n');
   std::vector<std::wstring> labels;
   std::size_t widest = 0;
-  for (const auto& candidate : candidates) {
-    widest = std::max(widest, widthOf(labels.emplace_back(label(candidate))) + 2);
+  for (const auto& [candidate, note] : candidates) {
+    const auto shownNote = note.empty() ? "" : " (" + note + ')';
+    labels.push_back(label(candidate) + toWide(shownNote));
+    widest = std::max(widest, widthOf(labels.back()) + 2);
   }
   const std::size_t columns = std::max<std::size_t>(1, size.ws_col / widest);
   const std::size_t shown =

@@ -1,0 +1,147 @@
+#include <strings.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <vector>
+
+#include "framework/CommandBase.h"
+#include "framework/WordList.h"
+
+namespace {
+
+using Candidates = CommandBase::Candidates;
+using Words = std::list<std::string>;
+
+constexpr auto kNextGroup = "--";
+
+/// What the help text of a handler says of its words.
+struct Usage {
+  std::vector<std::string> places;   // of words that come first, each as the text describes it
+  std::vector<std::string> options;  // those with a dash take words of their own
+};
+
+/// What ends a piece of a help text that starts with `opening`.
+char Closing(char opening) {
+  if (opening == '[') return ']';
+  return opening == '<' ? '>' : ' ';
+}
+
+/// Reads the brackets, angles and dashes in front of the description.
+Usage ReadUsage(const std::string& help) {
+  Usage usage;
+  for (auto at = help.find_first_not_of(' '); at != std::string::npos;
+       at = help.find_first_not_of(' ', at)) {
+    const char kind = help[at];
+    if (kind != '[' && kind != '<' && kind != '-') break;
+    const auto end = std::min(help.find(Closing(kind), at), help.size());
+    const auto text = help.substr(at + 1, end - at - 1);
+    if (kind == '-') {
+      usage.options.push_back('-' + text);
+    } else if (kind == '[' && text.find(' ') != std::string::npos) {
+      usage.places.push_back(text);
+    } else if (kind == '[') {
+      for (std::size_t start = 0, bar = 0; bar < text.size(); start = bar + 1) {
+        bar = std::min(text.find('|', start), text.size());
+        usage.options.push_back(text.substr(start, bar - start));
+      }
+    }
+    at = std::min(end + 1, help.size());
+  }
+  return usage;
+}
+
+/// Those of `candidates` that start with `start`.
+Candidates StartingWith(const std::string& start, Candidates candidates) {
+  std::erase_if(candidates, [&](const auto& one) { return !one.first.starts_with(start); });
+  return candidates;
+}
+
+/// The files whose paths start with `start`, folders with a slash at their end. A name with white
+/// space in it cannot be typed as a word; one with a dot in front is offered to who types the dot.
+Candidates Files(const std::string& start) {
+  Candidates files;
+  const auto folder = start.substr(0, start.rfind('/') + 1);
+  std::error_code unreadable;
+  std::filesystem::directory_iterator entry(folder.empty() ? "." : folder, unreadable);
+  for (; !unreadable && entry != end(entry); entry.increment(unreadable)) {
+    const std::string name = entry->path().filename();
+    const bool isShown = !name.starts_with('.') || start.size() > folder.size();
+    if (!isShown || convertLineToList(name) != Words{name}) continue;
+    std::error_code gone;
+    files[folder + name + (entry->is_directory(gone) ? "/" : "")];
+  }
+  return StartingWith(start, files);
+}
+
+/// After a handler and its `words`. Options are read in any case.
+Candidates Options(Usage usage, Words words, const std::string& start) {
+  for (const auto& place : usage.places) {
+    if (words.empty()) return place.ends_with("file path") ? Files(start) : Candidates();
+    words.pop_back();
+  }
+  auto& options = usage.options;
+  const auto isOption = [&options](const std::string& word) {
+    return std::ranges::any_of(options, [&word](const auto& option) {
+      return strcasecmp(option.c_str(), word.c_str()) == 0;
+    });
+  };
+  const bool takeWords =
+      std::ranges::any_of(options, [](const auto& option) { return option.starts_with('-'); });
+  // What comes next is a word for the option, or follows a word that ended the options.
+  const bool isFree =
+      takeWords ? !words.empty() && isOption(words.front()) : !std::ranges::all_of(words, isOption);
+  if (isFree || options.empty()) return {};
+  options.push_back(kNextGroup);
+  Candidates offered;
+  for (const auto& option : options) {
+    if (strncasecmp(option.c_str(), start.c_str(), start.size()) == 0) offered[option];
+  }
+  return offered;
+}
+
+}  // namespace
+
+CommandBase::Candidates CommandBase::complete(const std::string& typed) {
+  auto words = convertLineToList(typed + '.');  // so that there is a last word, if only the dot
+  auto start = words.front();
+  start.pop_back();
+  words.pop_front();
+  words.erase(std::ranges::find(words, kNextGroup), words.end());  // groups before the last
+  const bool isFirst = words.empty();
+  auto node = shared_from_this();  // looked up as the shell does
+  while (!words.empty()) {
+    const auto word = TakeNextWord(words);
+    if (word == "cd") return words.empty() ? node->completePath(start) : Candidates();
+    if (node->isValidCommand(word)) return Options(ReadUsage(node->helpOf(word)), words, start);
+    node = node->getSubCommandObj(word);
+    if (!node) return {};
+  }
+  return node->completeName(start, isFirst);
+}
+
+CommandBase::Candidates CommandBase::completeName(const std::string& start, bool isFirst) const {
+  Candidates names = commandNotes;
+  for (const auto& [handler, callable] : commandHandlers) names[handler];
+  for (const auto& [word, child] : subCommands) names[word];
+  for (const auto* const word : {"cd", "help"}) names[word];
+  if (isFirst) {
+    for (const auto* const word : {"back", "quit", "exit"}) names[word];
+  }
+  return StartingWith(start, names);
+}
+
+/// The paths that "cd" can follow from here, one element further than `start`.
+CommandBase::Candidates CommandBase::completePath(const std::string& start) {
+  const auto followed = start.substr(0, start.rfind('/') + 1);
+  auto node = shared_from_this();
+  for (const auto& element : splitCmdPath(followed)) {
+    node = node->getNodeAt(element);
+    if (!node) return {};
+  }
+  Candidates paths;
+  for (const auto& [word, child] : node->subCommands) {
+    paths[followed + word + (child->subCommands.empty() ? "" : "/")];
+  }
+  if (node->parent.lock()) paths[followed + ".."];
+  return StartingWith(start, paths);
+}
