@@ -35,7 +35,7 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   virtual void init();
 
   /// Prints the handlers with their help, the trees of the sub-commands and the shell's own words
-  /// to standard output, each line flushed at once.
+  /// to standard output, each line flushed at once. The format set on std::cout has no effect.
   virtual void displayHelp();
 
   /// Whether the shell may run the handler, or enter the sub-command, called `name`. An override

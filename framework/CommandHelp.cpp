@@ -1,18 +1,22 @@
-#include <iomanip>
+#include <algorithm>
 #include <iostream>
 
 #include "framework/CommandBase.h"
 
 namespace {
 
-constexpr int kNameWidth = 16;
+constexpr std::size_t kNameWidth = 16;
 constexpr auto kSeparator = "  -  ";
-constexpr auto kGreen = "\033[32m";
-constexpr auto kDefaultColour = "\033[39m";
 
-/// Starts a line of the listing: a tab and `word`, right-justified.
-std::ostream& StartLine(const std::string& word) {
-  return std::cout << '\t' << std::setw(kNameWidth) << word;
+/// Prints `line`, to be seen at once, through a pipe as well. Unformatted, so that the width, fill
+/// and flags of std::cout neither show nor change.
+void PrintLine(const std::string& line) {
+  std::cout.write(line.data(), static_cast<std::streamsize>(line.size())) << std::endl;
+}
+
+/// The start of a line of the listing: a tab and `word`, right-justified.
+std::string Justified(const std::string& word) {
+  return '\t' + std::string(kNameWidth - std::min(word.size(), kNameWidth), ' ') + word;
 }
 
 /// The names of a node's handlers, as "[bb|core]".
@@ -25,34 +29,29 @@ std::string Summarize(const std::map<std::string, CommandHandler>& handlers) {
 
 }  // namespace
 
-// std::endl throughout: each line is to be seen at once, through a pipe as well.
-
 void CommandBase::displayHelp() {
-  std::cout << std::endl;
-  std::cout << "Options for command '" << kGreen << name << kDefaultColour << "':" << std::endl;
-  std::cout << std::endl;
+  PrintLine("");
+  PrintLine("Options for command '\033[32m" + name + "\033[39m':");
+  PrintLine("");
   for (const auto& [handler, callable] : commandHandlers) {
-    StartLine(handler) << kSeparator << helpOf(handler) << std::endl;
-    std::cout << std::endl;
+    PrintLine(Justified(handler) + kSeparator + helpOf(handler));
+    PrintLine("");
   }
   for (const auto& [word, child] : subCommands) {
     printCommandTree(child, 0);
-    std::cout << std::endl;
+    PrintLine("");
   }
-  StartLine("cd") << kSeparator << "<sub-command>" << std::endl;
-  for (const auto* const word : {"help", "back", "quit"}) StartLine(word) << std::endl;
-  std::cout << std::endl;
+  PrintLine(Justified("cd") + kSeparator + "<sub-command>");
+  for (const auto* const word : {"help", "back", "quit"}) PrintLine(Justified(word));
+  PrintLine("");
 }
 
 void CommandBase::printCommandTree(const std::shared_ptr<CommandBase>& node, int depth) {
   if (!node->commandHandlers.empty()) {
-    if (depth == 0) {
-      StartLine(node->name);
-    } else {
-      std::cout << '\t' << std::string(static_cast<std::size_t>(depth) * kNameWidth, ' ')
-                << "     <" << node->name << '>';
-    }
-    std::cout << kSeparator << Summarize(node->commandHandlers) << std::endl;
+    const auto indent = std::string(static_cast<std::size_t>(depth) * kNameWidth, ' ');
+    const auto label =
+        depth == 0 ? Justified(node->name) : '\t' + indent + "     <" + node->name + '>';
+    PrintLine(label + kSeparator + Summarize(node->commandHandlers));
   }
   for (const auto& [word, child] : node->subCommands) printCommandTree(child, depth + 1);
 }

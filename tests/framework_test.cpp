@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <functional>
+#include <iomanip>
 #include <iostream>
 #include <sstream>
 
@@ -171,9 +172,20 @@ TEST(Command, ShowsItsTablesInOrderAndRunsWhatIsInThem) {
     });
   });
   const CapturedOutput out;
+  std::cout << std::left << std::setfill('*') << std::setw(20);  // what others have left there
   root->CommandBase::displayHelp();
+  EXPECT_EQ(std::cout.width(0), 20);
+  std::cout.copyfmt(std::ios(nullptr));
   forEachRow("help", 1, [&out](const Row& row) { EXPECT_EQ(out.str(), row[0]); });
   EXPECT_TRUE(root->execCommand("b", {}));
+  root->addCommandHandler(
+      "anew",
+      [&root, own = std::make_shared<int>()](auto, auto) {
+        root->handler("anew");
+        return own.use_count() == 1;
+      },
+      "");
+  EXPECT_TRUE(root->execCommand("anew", {}));
   EXPECT_FALSE(root->execCommand("null", {}) || root->execCommand("none", {}));
 }
 
