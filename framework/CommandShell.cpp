@@ -1,24 +1,8 @@
 #include "framework/CommandShell.h"
 
 #include <iostream>
-#include <limits>
-#include <new>
 
 #include "framework/WordList.h"
-
-namespace {
-
-/// Reads a line of standard input. False at its end. Throws `std::bad_alloc`, with the line passed
-/// over, when it does not fit into memory.
-bool ReadTypedLine(std::string& line) {
-  if (std::getline(std::cin, line)) return true;
-  if (!std::cin.bad()) return false;
-  std::cin.clear();  // not the stream has failed, but the string
-  if (std::cin.ignore(std::numeric_limits<std::streamsize>::max(), '\n')) throw std::bad_alloc();
-  return false;
-}
-
-}  // namespace
 
 std::list<std::string> CommandShell::convertCmdArgsToList(int argc, const char* const* argv) {
   std::list<std::string> words;
@@ -36,22 +20,17 @@ bool CommandShell::run(std::list<std::string> words) {
   return runLines() != Outcome::failed;
 }
 
-/// Prompts and runs lines until one of them quits, or standard input ends, which is a failure. A
-/// line for which there is too little memory is refused.
+/// Prompts and runs lines until one of them quits, or none can be read, which is a failure.
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
     currentCommand = promptCommand;
-    try {
-      std::string line;
-      if (!readLine(line)) return Outcome::failed;
-      if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
-    } catch (const std::bad_alloc&) {
-      std::cerr << "Not enough memory for this line" << std::endl;
-    }
+    std::string line;
+    if (!readLine(line)) return Outcome::failed;
+    if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
   }
 }
 
-/// Prompts and reads a line, edited where the reader of the shell can do that. False at the end.
+/// Prompts and reads a line, edited where the reader of the shell can do that.
 bool CommandShell::readLine(std::string& line) const {
   const auto prompt = '(' + promptCommand->getHierarchy() + ")>> ";
   if (readEdited) {
@@ -62,7 +41,7 @@ bool CommandShell::readLine(std::string& line) const {
     if (const auto isLine = readEdited(prompt, complete, line)) return *isLine;
   }
   std::cout << prompt << std::flush;
-  return ReadTypedLine(line);
+  return static_cast<bool>(std::getline(std::cin, line));
 }
 
 /// Runs the groups of `words` until one does not succeed.

@@ -11,24 +11,22 @@
 /// Runs a command tree for a user: the words of a command line once, or lines typed at a prompt
 /// that names the node where it stands.
 ///
-/// A subclass supplies the tree. Threads: one, on which every handler runs as well. It writes to
-/// standard output and error and reads standard input through the standard streams, except for
-/// lines that a person edits.
+/// A subclass supplies the tree. It reads std::cin and writes to std::cout, but for lines that the
+/// reader it was given has a person edit. Threads: one, on which every handler runs as well.
 class CommandShell {
  public:
   /// As `CommandBase::complete`, of the node where the prompt stands.
   using Completer = std::function<CommandBase::Candidates(const std::string& typed)>;
 
-  /// Shows the prompt and has a person edit a line, which it leaves, without its line end, in the
-  /// empty `line`. True for a line, false when the input has ended; nothing, before it has shown or
-  /// read anything, where no line can be edited.
+  /// Shows `prompt` and has a person edit a line, which it leaves, without its line end, in the
+  /// empty `line`. True for a line; false when the input has ended; nothing, with nothing shown or
+  /// read, where no line can be edited.
   using LineReader = std::function<std::optional<bool>(
       const std::string& prompt, const Completer& complete, std::string& line)>;
 
   CommandShell() = default;
 
-  /// Lines are read with `readEdited`, and where that can edit none, or is empty, from standard
-  /// input as they are.
+  /// Reads lines with `readEdited`, which may be empty, and from std::cin where that can edit none.
   explicit CommandShell(LineReader readEdited) : readEdited(std::move(readEdited)) {}
 
   CommandShell(const CommandShell&) = delete;
@@ -41,8 +39,7 @@ class CommandShell {
   /// Runs the command line `words`, the program's name at its back; called once. Without further
   /// words it prompts and runs line after line. Returns true when every command group of the
   /// command line succeeded, or "quit" or "exit" was typed; false when one failed, no tree could
-  /// be made, or standard input ended. A typed line for which there is too little memory is refused
-  /// on standard error; a command line is not, and throws `std::bad_alloc`.
+  /// be made, or no further line could be read.
   [[nodiscard]] bool run(std::list<std::string> words);
 
  protected:

@@ -4,7 +4,6 @@
 #include <system_error>
 
 #include "platform/system.h"
-#include "platform/terminal.h"
 #include "platform/zub_client.h"
 #include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"
@@ -42,8 +41,6 @@ std::shared_ptr<CommandBase> Connect() {
 }
 
 }  // namespace
-
-ZUBShell::ZUBShell() : CommandShell(platform::readEditedLine) {}
 
 std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
   try {

@@ -5,7 +5,7 @@
 /// The tool's shell. Making its root command connects the tool to the baseband manager server.
 class ZUBShell : public CommandShell {
  public:
-  ZUBShell();
+  using CommandShell::CommandShell;
 
  protected:
   /// Makes the tool queue and the manager, follows the server's state (see ServerState.h), gives

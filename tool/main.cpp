@@ -7,6 +7,7 @@
 #include <new>
 
 #include "platform/system.h"
+#include "platform/terminal.h"
 #include "tool/StartUpChecks.h"
 #include "tool/ZUBShell.h"
 
@@ -32,7 +33,7 @@ extern "C" void* runShellThread(void* given) {
   pthread_sigmask(SIG_SETMASK, &start.signals, nullptr);
   try {
     const auto commandLine = start.words;
-    const std::shared_ptr<CommandShell> shell(new ZUBShell);
+    const std::shared_ptr<CommandShell> shell(new ZUBShell(platform::readEditedLine));
     const bool succeeded = shell->run(commandLine);
     std::exit(succeeded ? EXIT_SUCCESS : EXIT_FAILURE);  // with the shell and its tree alive
   } catch (const std::bad_alloc&) {
