@@ -10,19 +10,17 @@
 
 namespace {
 
-enum class Word { none, off, on, full, lite };
-
-Word ReadWord(const std::string& value) {
+/// The mode that a word means; none for any other text.
+std::optional<std::int32_t> ModeOfWord(const std::string& value) {
   static constexpr struct {
-    const char* text;
-    Word word;
-  } kWords[] = {{"false", Word::off}, {"off", Word::off},  {"no", Word::off},
-                {"true", Word::on},   {"on", Word::on},    {"yes", Word::on},
-                {"full", Word::full}, {"lite", Word::lite}};
-  for (const auto& [text, word] : kWords) {
-    if (util::equal_nocase(value, text)) return word;
+    const char* word;
+    std::int32_t mode;
+  } kModes[] = {{"false", 0}, {"off", 0}, {"no", 0},   {"true", 1},
+                {"on", 1},    {"yes", 1}, {"full", 1}, {"lite", 2}};
+  for (const auto& [word, mode] : kModes) {
+    if (util::equal_nocase(value, word)) return mode;
   }
-  return Word::none;
+  return std::nullopt;
 }
 
 /// The base that the prefix of a number means. Not left to strtoll, which knows more prefixes in
@@ -47,17 +45,7 @@ std::optional<std::int64_t> ReadNumber(const std::string& value) {
 }  // namespace
 
 std::optional<std::int32_t> ParseTraceMode(const std::string& value) {
-  switch (ReadWord(value)) {
-    case Word::off:
-      return 0;
-    case Word::on:
-    case Word::full:
-      return 1;
-    case Word::lite:
-      return 2;
-    case Word::none:
-      break;
-  }
+  if (const auto mode = ModeOfWord(value)) return mode;
   using Range = std::numeric_limits<std::int32_t>;
   const auto number = ReadNumber(value);
   if (!number || *number < Range::min() || *number > Range::max()) return std::nullopt;
@@ -65,8 +53,9 @@ std::optional<std::int32_t> ParseTraceMode(const std::string& value) {
 }
 
 void parseBoolProperty(const std::string& value, bool& flag) {
-  const auto word = ReadWord(value);
-  const auto number = word == Word::none ? ReadNumber(value) : std::nullopt;
-  if (word == Word::off || number == 0) flag = false;
-  if (word == Word::on || word == Word::full || word == Word::lite || number == 1) flag = true;
+  if (const auto mode = ModeOfWord(value)) {
+    flag = *mode != 0;
+  } else if (const auto number = ReadNumber(value); number == 0 || number == 1) {
+    flag = number == 1;
+  }
 }
