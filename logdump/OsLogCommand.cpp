@@ -12,15 +12,6 @@ namespace {
 
 using Words = std::list<std::string>;
 
-const char* const kDefaultProcesses[] = {"Orvalind",
-                                         "OrvalindMobileHelper",
-                                         "OrvalindRootHelper",
-                                         "zub-helper",
-                                         "Spectrumd",
-                                         "qel.Diagplug.Cellular",
-                                         "voltd"};
-const char* const kDefaultImagePaths[] = {"Modemcore"};
-
 /// The whole number at the front of `word`, or 0, cut to the range of a signed 32-bit number.
 double ReadSeconds(const std::string& word) {
   using Range = std::numeric_limits<std::int32_t>;
@@ -55,8 +46,14 @@ bool ExportLog(Words words) {
   Words processes;
   Words imagePaths;
   if (words.empty()) {
-    processes.assign(std::begin(kDefaultProcesses), std::end(kDefaultProcesses));
-    imagePaths.assign(std::begin(kDefaultImagePaths), std::end(kDefaultImagePaths));
+    processes = {"Orvalind",
+                 "OrvalindMobileHelper",
+                 "OrvalindRootHelper",
+                 "zub-helper",
+                 "Spectrumd",
+                 "qel.Diagplug.Cellular",
+                 "voltd"};
+    imagePaths = {"Modemcore"};
   } else {
     ParseSelection(std::move(words), processes, imagePaths);
   }
