@@ -9,7 +9,8 @@
 /// Threads: every function may be called from any thread. None of them fails: a code that a device
 /// does not know is 0, any other answer false.
 
-/// The products that the tool knows by name. The codes are those of the device's services.
+/// The products that the tool knows by name. The codes are those of the device's services; those of
+/// the watches follow one another.
 enum class TelephonyProduct : int {
   Unknown = 0,
   Phone = 1,

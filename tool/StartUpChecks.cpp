@@ -1,7 +1,6 @@
 #include "tool/StartUpChecks.h"
 
 #include "platform/telephony.h"
-#include "tool/Watch.h"
 
 namespace {
 
@@ -20,4 +19,9 @@ const char* WhyNotToStart() {
     return "Orvalind process is not running. Please run/load Orvalind (or modemd) and try again.";
   }
   return nullptr;
+}
+
+bool config::hw::watch() {
+  const auto product = static_cast<TelephonyProduct>(TelephonyRadiosGetProduct());
+  return product >= TelephonyProduct::Watch1Small && product <= TelephonyProduct::Watch7Large;
 }

@@ -1,5 +1,13 @@
 #pragma once
 
-/// The message that says why the tool cannot run on this device; null when it can. The product must
-/// have a cellular radio, and, unless it is a watch, the telephony or the baseband daemon must run.
+/// Returns the message that says why the tool cannot run on this device, or null when it can. The
+/// product must have a cellular radio and, unless it is a watch, a running telephony or baseband
+/// daemon.
 const char* WhyNotToStart();
+
+namespace config::hw {
+
+/// Whether this product is a watch.
+bool watch();
+
+}  // namespace config::hw
