@@ -7,13 +7,14 @@
 ///
 /// The manager and the queue are shared by all nodes and live at least as long as any of them.
 class ZUBCommandBase : public CommandBase {
- protected:
-  ZUBCommandBase(const std::string& name, std::weak_ptr<CommandBase> parent,
-                 std::shared_ptr<zub::client::Manager> manager, dispatch::queue queue);
-
  public:
-  ~ZUBCommandBase() override;
-
   const std::shared_ptr<zub::client::Manager> manager;
   const dispatch::queue queue;  ///< on which the manager's callbacks run
+
+ protected:
+  ZUBCommandBase(const std::string& name, std::weak_ptr<CommandBase> parent,
+                 std::shared_ptr<zub::client::Manager> manager, dispatch::queue queue)
+      : CommandBase(name, std::move(parent)),
+        manager(std::move(manager)),
+        queue(std::move(queue)) {}
 };
