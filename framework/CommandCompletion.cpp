@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <vector>
 
 #include "framework/CommandBase.h"
 #include "framework/WordList.h"
@@ -16,8 +15,8 @@ constexpr auto kNextGroup = "--";
 
 /// What the help text of a handler says of its words.
 struct Usage {
-  std::vector<std::string> places;   // of words that come first, each as the text describes it
-  std::vector<std::string> options;  // those with a dash take words of their own
+  Words places;   // of words that come first, each as the text describes it
+  Words options;  // those with a dash take words of their own
 };
 
 /// What ends a piece of a help text that starts with `opening`.
@@ -34,16 +33,14 @@ Usage ReadUsage(const std::string& help) {
     const char kind = help[at];
     if (kind != '[' && kind != '<' && kind != '-') break;
     const auto end = std::min(help.find(Closing(kind), at), help.size());
-    const auto text = help.substr(at + 1, end - at - 1);
+    auto text = help.substr(at + 1, end - at - 1);
     if (kind == '-') {
       usage.options.push_back('-' + text);
     } else if (kind == '[' && text.find(' ') != std::string::npos) {
       usage.places.push_back(text);
     } else if (kind == '[') {
-      for (std::size_t start = 0, bar = 0; bar < text.size(); start = bar + 1) {
-        bar = std::min(text.find('|', start), text.size());
-        usage.options.push_back(text.substr(start, bar - start));
-      }
+      std::ranges::replace(text, '|', ' ');
+      usage.options.splice(usage.options.end(), convertLineToList(text));
     }
     at = std::min(end + 1, help.size());
   }

@@ -63,7 +63,9 @@ CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
     const auto word = TakeNextWord(words);
     if (word == "cd") return changeDirectory(words);
     if (currentCommand->isValidCommand(word)) {
-      return outcomeOf(currentCommand->isAllowed(word) && currentCommand->execCommand(word, words));
+      const bool succeeded =
+          currentCommand->isAllowed(word) && currentCommand->execCommand(word, words);
+      return succeeded ? Outcome::succeeded : Outcome::failed;
     }
     if (!currentCommand->isValidSubCommand(word)) {
       return runShellWord(word, words.empty(), isOneWord);
@@ -84,7 +86,8 @@ CommandShell::Outcome CommandShell::runShellWord(const std::string& word, bool i
     return Outcome::succeeded;
   }
   if (isWholeGroup && word == "back") {
-    goBack();
+    const auto above = promptCommand ? promptCommand->getParent().lock() : nullptr;
+    if (above) promptCommand = above;
     return Outcome::succeeded;
   }
   if (isWholeGroup && (word == "quit" || word == "exit")) return Outcome::quit;
@@ -112,9 +115,4 @@ bool CommandShell::followPath(const std::string& path) {
     currentCommand = std::move(next);
   }
   return true;
-}
-
-void CommandShell::goBack() {
-  if (!promptCommand) return;
-  if (const auto above = promptCommand->getParent().lock()) promptCommand = above;
 }

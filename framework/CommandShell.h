@@ -51,8 +51,6 @@ class CommandShell {
   /// How a command group, or a batch of them, ended.
   enum class Outcome { succeeded, failed, quit };
 
-  static Outcome outcomeOf(bool success) { return success ? Outcome::succeeded : Outcome::failed; }
-
   Outcome runLines();
   bool readLine(std::string& line) const;
   Outcome runBatch(const std::list<std::string>& words);
@@ -60,7 +58,6 @@ class CommandShell {
   Outcome runShellWord(const std::string& word, bool isLast, bool isWholeGroup);
   Outcome changeDirectory(const std::list<std::string>& words);
   bool followPath(const std::string& path);
-  void goBack();
 
   std::shared_ptr<CommandBase> rootCommand;
   std::shared_ptr<CommandBase> promptCommand;   // where the prompt stands; empty in a one-shot run
