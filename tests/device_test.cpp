@@ -125,17 +125,24 @@ TEST(RequestLog, SaysWhyItCannotBeWritten) {
 TEST(Server, IsAskedAndKeepsHandlersWhileItsStateChanges) {
   host::device().server = {{0ms, "Started"}, {20ms, "Started"}};
   host::device().dumpDelay = 40ms;
-  const auto use = [](const std::shared_ptr<int>& owned) {  // shares nothing with another thread's
-    const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
+  const auto use = [] {  // shares nothing with another thread's
+    const dispatch::queue queue("test");
+    const auto manager = zub::client::CreateManager("test", queue);
+    const auto calls = std::make_shared<int>();
     for (int i = 0; i < 100; ++i) {
-      zub::client::RegisterEventHandler(manager, "event", [owned](const auto&, const auto&) {});
+      zub::client::RegisterEventHandler(manager, zub::kEventServerStateChange,
+                                        [calls](const auto&, const auto&) { ++*calls; });
     }
+    zub::client::EventsOff(manager);
+    zub::client::EventsOn(manager);
+    const auto asked = dispatch::group::create();
+    queue.async([calls, member = dispatch::membership(asked)] { EXPECT_GE(*calls, 100); });
     lumo::object reply;
     zub::client::PerformCommand(manager, zub::kCommandTraceDumpState, {}, &reply);
-    EXPECT_EQ(owned.use_count(), 101);
+    asked.wait();
   };
-  const std::jthread other([&use] { use(std::make_shared<int>()); });
-  use(std::make_shared<int>());
+  const std::jthread other(use);
+  use();
 }
 
 TEST(Server, FailsADumpForWhichThereIsNoThread) {
