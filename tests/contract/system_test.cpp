@@ -2,11 +2,17 @@
 
 #include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/socket.h>
 #include <sys/stat.h>
+#include <sys/time.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <atomic>
+#include <csignal>
 #include <fstream>
 #include <iostream>
+#include <thread>
 
 #include "platform/telephony.h"
 #include "tests/Program.h"
@@ -52,10 +58,15 @@ TEST(StandardStreams, AreOpenIfTheyWereClosed) {
   EXPECT_EXIT(open(), testing::ExitedWithCode(0), "");
 }
 
-TEST(StandardStreams, GoOnAfterAFailureAndWriteEachLineAtOnce) {
+TEST(StandardStreams, GoOnAfterAFailureWriteEachLineAtOnceAndDropNoByte) {
   platform::openStandardStreams();
   int ends[2];  // of a pipe from which a read takes what one write has written
   ASSERT_EQ(pipe2(ends, O_CLOEXEC | O_DIRECT | O_NONBLOCK), 0);
+  const auto take = [&ends] {
+    char text[8192];
+    return std::string(
+        text, static_cast<std::size_t>(std::max(read(ends[0], text, sizeof text), ssize_t{0})));
+  };
   const int full = open("/dev/full", O_WRONLY | O_CLOEXEC);
   for (auto [stream, number] :
        {std::pair(&std::cout, STDOUT_FILENO), {&std::cerr, STDERR_FILENO}}) {
@@ -64,11 +75,56 @@ TEST(StandardStreams, GoOnAfterAFailureAndWriteEachLineAtOnce) {
     *stream << "lost" << std::endl;
     dup2(ends[1], number);
     *stream << "line " << 1 << std::endl;
+    const auto line = take();
+    std::size_t written = 0;
+    for (; written < 10'000; ++written) stream->put('x');  // more than a buffer holds
+    *stream << std::flush;
     dup2(before, number);
-    char text[64] = {};
-    EXPECT_GT(read(ends[0], text, sizeof text - 1), 0);
-    EXPECT_STREQ(text, "line 1\n");
+    EXPECT_EQ(line, "line 1\n");
+    for (auto piece = take(); !piece.empty(); piece = take()) written -= piece.size();
+    EXPECT_EQ(written, 0U);
   }
+}
+
+TEST(StandardStreams, WaitThroughSignals) {
+  platform::openStandardStreams();
+  static std::atomic<int> ticks = 0;
+  struct sigaction onTick = {};
+  onTick.sa_handler = [](int) { ++ticks; };
+  sigaction(SIGALRM, &onTick, nullptr);
+  itimerval timer = {{0, 1000}, {0, 1000}};
+  setitimer(ITIMER_REAL, &timer, nullptr);
+  const std::string text(1 << 20, 'x');  // more than a socket holds
+  for (const int flags : {0, O_NONBLOCK}) {
+    int ends[2];
+    ASSERT_EQ(socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends), 0);
+    fcntl(ends[0], F_SETFL, flags);
+    const int before = dup(STDOUT_FILENO);
+    for (const int stream : {STDIN_FILENO, STDOUT_FILENO}) dup2(ends[0], stream);
+    std::string received(text.size(), '\0');
+    std::jthread other([&] {
+      const auto interruptOften = [] {
+        for (const int until = ticks + 20; ticks < until;) std::this_thread::yield();
+      };
+      sigset_t tick;
+      sigemptyset(&tick);
+      sigaddset(&tick, SIGALRM);
+      pthread_sigmask(SIG_BLOCK, &tick, nullptr);
+      interruptOften();
+      recv(ends[1], received.data(), received.size(), MSG_WAITALL);
+      interruptOften();
+      send(ends[1], "answer\n", 7, 0);
+    });
+    std::cout << text << std::flush;
+    shutdown(ends[0], SHUT_WR);
+    std::string answer;
+    std::getline(std::cin, answer);
+    dup2(before, STDOUT_FILENO);
+    other.join();
+    EXPECT_TRUE(received == text);
+    EXPECT_EQ(answer, "answer");
+  }
+  setitimer(ITIMER_REAL, &(timer = {}), nullptr);
 }
 
 TEST(Text, IsComparedWithoutTheCaseOfAsciiLetters) {
