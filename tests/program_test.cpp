@@ -1,9 +1,16 @@
 // The real program where a case of tests/cases cannot say what is to be seen.
 
 #include <gtest/gtest.h>
+#include <sched.h>
+#include <sys/mount.h>
 #include <sys/resource.h>
+#include <sys/socket.h>
+#include <sys/un.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <algorithm>
+#include <cstring>
 
 #include "tests/Program.h"
 
@@ -51,6 +58,43 @@ TEST(Program, ExportsTheLogOfARealMachine) {
   writeFile(own, readFile(data + "export"));
   expectOutcome(run({{"logdump", "oslog", "600", own}, "log = " + own}), {.status = 1});
   EXPECT_EQ(readFile(own), readFile(data + "export")) << "the log is no place to export it to";
+}
+
+/// Whether this process got a /dev of its own, with nothing in it.
+bool hideDevices() {
+  const bool isRoot = geteuid() == 0;
+  const auto user = std::to_string(geteuid());
+  const auto group = std::to_string(getegid());
+  if (unshare(isRoot ? CLONE_NEWNS : CLONE_NEWNS | CLONE_NEWUSER) != 0) return false;
+  if (!isRoot) {
+    writeFile("/proc/self/uid_map", user + " " + user + " 1");
+    writeFile("/proc/self/setgroups", "deny");
+    writeFile("/proc/self/gid_map", group + " " + group + " 1");
+  }
+  return mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
+         mount("none", "/dev", "tmpfs", 0, nullptr) == 0;
+}
+
+TEST(Program, ReportsErrorsToTheSystemLogUnderItsName) {
+  const pid_t child = fork();
+  if (child == 0) {
+    if (!hideDevices()) _exit(77);
+    const int log = socket(AF_UNIX, SOCK_DGRAM, 0);
+    const sockaddr_un address = {AF_UNIX, "/dev/log"};
+    EXPECT_EQ(bind(log, reinterpret_cast<const sockaddr*>(&address), sizeof address), 0);
+    const std::string line("logdump oslog 600 no\0/such\nquit\n", 33);
+    expectOutcome(run({.input = line, .name = "./a/name"}), {.out = "(/name)>> (/name)>> "});
+    char text[100] = {};
+    recv(log, text, sizeof text, MSG_DONTWAIT);
+    EXPECT_TRUE(std::string_view(text).starts_with("<11>")) << text;  // the level of an error
+    EXPECT_STREQ(text + std::strlen("<11>Jan  1 00:00:00 "),
+                 "name: Failed to create file: no?/such");
+    _exit(testing::Test::HasFailure() ? 1 : 0);
+  }
+  int status = 0;
+  waitpid(child, &status, 0);
+  if (WEXITSTATUS(status) == 77) GTEST_SKIP() << "no mount namespace may be had";
+  EXPECT_EQ(status, 0);
 }
 
 TEST(Program, EndsWhenTheShellThreadCannotStart) {
