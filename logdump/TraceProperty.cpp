@@ -55,7 +55,7 @@ std::optional<std::int32_t> ParseTraceMode(const std::string& value) {
 void parseBoolProperty(const std::string& value, bool& flag) {
   if (const auto mode = ModeOfWord(value)) {
     flag = *mode != 0;
-  } else if (const auto number = ReadNumber(value); number == 0 || number == 1) {
-    flag = number == 1;
+  } else if (const auto number = ReadNumber(value); number && (*number == 0 || *number == 1)) {
+    flag = *number == 1;
   }
 }
