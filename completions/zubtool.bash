@@ -33,11 +33,10 @@ _zubtool() {
         *) [[ ${group[-1]} == -[pi] ]] || offered='-p -i --' ;;
       esac
       ;;
-    *) offered='--' ;;
   esac
   if [[ ${group[1]-} == @(tel|core|bb) ]]; then
     for word in "${group[@]:2}"; do  # options end at the reason
-      [[ ${word,,} == @(nocompress|tar.gz|tar|nonui) ]] || offered='--'
+      [[ ${word,,} == @(nocompress|tar.gz|tar|nonui) ]] || offered=''
     done
   fi
   mapfile -t COMPREPLY < <(compgen -W "$offered" -- "$current")

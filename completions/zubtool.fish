@@ -27,7 +27,7 @@ function __zubtool_offer
         tar\t'pack them into an archive'
     set -l no_ui nonui\t'ask nobody for confirmation'
     set -l next --\t'end of the command, another follows'
-    set -l offered $next
+    set -l offered
     switch "$group[1..2]"
         case ''
             set offered \
@@ -65,7 +65,7 @@ function __zubtool_offer
     if contains -- "$group[2]" tel core bb
         for word in $group[3..] # options end at the reason
             contains -- (string lower -- $word) nocompress tar.gz tar nonui
-            or set offered $next
+            or set offered
         end
     end
     printf '%s\n' $offered
