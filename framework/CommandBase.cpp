@@ -51,7 +51,7 @@ bool CommandBase::execCommand(const std::string& name, const std::list<std::stri
   if (found == commandHandlers.end()) return false;
   const auto group = dispatch::group::create();
   if (!group) return false;  // nothing would wait for the handler's work
-  // Held here as well: the handler may register another one in its place.
+  // A reference of its own: the handler may register another one in its place.
   const auto handler = found->second;
   const bool succeeded = handler(group, words);
   group.wait();

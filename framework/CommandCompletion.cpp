@@ -13,13 +13,13 @@ using Words = std::list<std::string>;
 
 constexpr auto kNextGroup = "--";
 
-/// What the help text of a handler says of its words.
+/// The arguments of a handler, from its help text.
 struct Usage {
-  Words places;   // of words that come first, each as the text describes it
-  Words options;  // those with a dash take words of their own
+  Words places;   ///< descriptions of the arguments that come first
+  Words options;  ///< those with a dash take arguments
 };
 
-/// What ends a piece of a help text that starts with `opening`.
+/// The end of a piece of a help text that starts with `opening`.
 char Closing(char opening) {
   if (opening == '[') return ']';
   return opening == '<' ? '>' : ' ';
@@ -53,8 +53,9 @@ Candidates StartingWith(const std::string& start, Candidates candidates) {
   return candidates;
 }
 
-/// The files whose paths start with `start`, folders with a slash at their end. A name with white
-/// space in it cannot be typed as a word; one with a dot in front is offered to who types the dot.
+/// The files whose paths start with `start`; folders end in a slash. Names with white space are
+/// left out, because they cannot be typed as a word, and so are hidden files unless the dot is
+/// typed.
 Candidates Files(const std::string& start) {
   Candidates files;
   const auto folder = start.substr(0, start.rfind('/') + 1);
@@ -70,7 +71,7 @@ Candidates Files(const std::string& start) {
   return StartingWith(start, files);
 }
 
-/// After a handler and its `words`. Options are read in any case.
+/// Candidates after a handler and its `words`.
 Candidates Options(Usage usage, Words words, const std::string& start) {
   for (const auto& place : usage.places) {
     if (words.empty()) return place.ends_with("file path") ? Files(start) : Candidates();
@@ -84,7 +85,7 @@ Candidates Options(Usage usage, Words words, const std::string& start) {
   };
   const bool takeWords =
       std::ranges::any_of(options, [](const auto& option) { return option.starts_with('-'); });
-  // What comes next is a word for the option, or follows a word that ended the options.
+  // The next word is an argument of an option, or follows the word that ended the options.
   const bool isFree =
       takeWords ? !words.empty() && isOption(words.front()) : !std::ranges::all_of(words, isOption);
   if (isFree || options.empty()) return {};
@@ -99,13 +100,13 @@ Candidates Options(Usage usage, Words words, const std::string& start) {
 }  // namespace
 
 CommandBase::Candidates CommandBase::complete(const std::string& typed) {
-  auto words = convertLineToList(typed + '.');  // so that there is a last word, if only the dot
+  auto words = convertLineToList(typed + '.');  // the dot makes sure of a last word
   auto start = words.front();
   start.pop_back();
   words.pop_front();
-  words.erase(std::ranges::find(words, kNextGroup), words.end());  // groups before the last
+  words.erase(std::ranges::find(words, kNextGroup), words.end());  // earlier groups
   const bool isFirst = words.empty();
-  auto node = shared_from_this();  // looked up as the shell does
+  auto node = shared_from_this();  // found as the shell finds it
   while (!words.empty()) {
     const auto word = TakeNextWord(words);
     if (word == "cd") return words.empty() ? node->completePath(start) : Candidates();
@@ -127,7 +128,7 @@ CommandBase::Candidates CommandBase::completeName(const std::string& start, bool
   return StartingWith(start, names);
 }
 
-/// The paths that "cd" can follow from here, one element further than `start`.
+/// The paths of "cd" that start with `start` and have no further slash but at their end.
 CommandBase::Candidates CommandBase::completePath(const std::string& start) {
   const auto followed = start.substr(0, start.rfind('/') + 1);
   auto node = shared_from_this();

@@ -8,8 +8,8 @@ namespace {
 constexpr std::size_t kNameWidth = 16;
 constexpr auto kSeparator = "  -  ";
 
-/// Prints `line`, to be seen at once, through a pipe as well. Unformatted, so that the width, fill
-/// and flags of std::cout neither show nor change.
+/// Prints and flushes `line`. Unformatted output neither uses nor changes the width, fill and flags
+/// of std::cout.
 void PrintLine(const std::string& line) {
   std::cout.write(line.data(), static_cast<std::streamsize>(line.size())) << std::endl;
 }

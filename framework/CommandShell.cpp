@@ -20,7 +20,7 @@ bool CommandShell::run(std::list<std::string> words) {
   return runLines() != Outcome::failed;
 }
 
-/// Prompts and runs lines until one of them quits, or none can be read, which is a failure.
+/// Prompts and runs lines until one of them quits or, which is a failure, none can be read.
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
     currentCommand = promptCommand;
@@ -30,7 +30,7 @@ CommandShell::Outcome CommandShell::runLines() {
   }
 }
 
-/// Prompts and reads a line, edited where the reader of the shell can do that.
+/// Prompts and reads a line. False if there is none.
 bool CommandShell::readLine(std::string& line) const {
   const auto prompt = '(' + promptCommand->getHierarchy() + ")>> ";
   if (readEdited) {
@@ -56,7 +56,7 @@ CommandShell::Outcome CommandShell::runBatch(const std::list<std::string>& words
 }
 
 /// Resolves the words of one group in turn. Handlers come before sub-commands, and both before the
-/// shell's own words, of which only "cd" cannot be taken over.
+/// shell's own words except "cd".
 CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
   const bool isOneWord = words.size() == 1;
   for (;;) {
@@ -106,8 +106,8 @@ CommandShell::Outcome CommandShell::changeDirectory(const std::list<std::string>
   return Outcome::succeeded;
 }
 
-/// Moves the current node along `path`; false at the first element that leads nowhere. Moving about
-/// runs nothing, so no node is asked for permission.
+/// Moves the current node along `path`; false at the first element that leads nowhere. No node is
+/// asked for permission, because nothing runs.
 bool CommandShell::followPath(const std::string& path) {
   for (const auto& element : splitCmdPath(path)) {
     auto next = currentCommand->getNodeAt(element);

@@ -8,47 +8,48 @@
 
 #include "framework/CommandBase.h"
 
-/// Runs a command tree for a user: the words of a command line once, or lines typed at a prompt
-/// that names the node where it stands.
+/// Runs a command tree for a user: the words of a command line once, or line after line typed at a
+/// prompt, which shows the hierarchy of the current node.
 ///
-/// A subclass supplies the tree. It reads std::cin and writes to std::cout, but for lines that the
-/// reader it was given has a person edit. Threads: one, on which every handler runs as well.
+/// A subclass supplies the tree. The shell reads std::cin and writes to std::cout; if it is given a
+/// reader of edited lines, that reads and prompts instead. Threads: one, which also runs the
+/// handlers.
 class CommandShell {
  public:
-  /// As `CommandBase::complete`, of the node where the prompt stands.
+  /// `CommandBase::complete` of the node at which the prompt stands.
   using Completer = std::function<CommandBase::Candidates(const std::string& typed)>;
 
-  /// Shows `prompt` and has a person edit a line, which it leaves, without its line end, in the
-  /// empty `line`. True for a line; false when the input has ended; nothing, with nothing shown or
-  /// read, where no line can be edited.
+  /// Shows `prompt`, lets the user edit a line and stores it in `line`, which was empty, without a
+  /// line end. Returns true for a line and false at the end of the input; no value, and shows and
+  /// reads nothing, if lines cannot be edited here.
   using LineReader = std::function<std::optional<bool>(
       const std::string& prompt, const Completer& complete, std::string& line)>;
 
   CommandShell() = default;
 
-  /// Reads lines with `readEdited`, which may be empty, and from std::cin where that can edit none.
+  /// Reads lines with `readEdited`, or from std::cin if that is empty or returns no value.
   explicit CommandShell(LineReader readEdited) : readEdited(std::move(readEdited)) {}
 
   CommandShell(const CommandShell&) = delete;
   CommandShell& operator=(const CommandShell&) = delete;
   virtual ~CommandShell() = default;
 
-  /// All `argc` arguments as a word list (see WordList.h), the program's name at its back.
+  /// The `argc` arguments as a word list (see WordList.h), whose back is the program's name.
   static std::list<std::string> convertCmdArgsToList(int argc, const char* const* argv);
 
-  /// Runs the command line `words`, the program's name at its back; called once. Without further
-  /// words it prompts and runs line after line. Returns true when every command group of the
-  /// command line succeeded, or "quit" or "exit" was typed; false when one failed, no tree could
-  /// be made, or no further line could be read.
+  /// Runs the command line `words`, whose back is the program's name, or prompts for lines if there
+  /// are no other words. Returns true when every command group of the command line succeeded, or at
+  /// "quit" or "exit"; false when one failed, the tree could not be made, or no line could be read.
+  /// Called once.
   [[nodiscard]] bool run(std::list<std::string> words);
 
  protected:
-  /// Builds the tree and returns its root, or an empty pointer when it cannot be made. Called once,
-  /// first of all, by `run`.
+  /// Builds the tree and returns its root, or an empty pointer if that is not possible. Called
+  /// once, at the start of `run`.
   virtual std::shared_ptr<CommandBase> createRootCommand() = 0;
 
  private:
-  /// How a command group, or a batch of them, ended.
+  /// The end of a command group or of a batch of them.
   enum class Outcome { succeeded, failed, quit };
 
   Outcome runLines();

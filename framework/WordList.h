@@ -4,24 +4,23 @@
 #include <string>
 #include <vector>
 
-/// Turns raw input into words and words into command groups.
+/// Splits input into words and words into command groups.
 ///
-/// A word list holds its words in reverse order: the first word typed is the list's back, the last
-/// its front. Producers insert each new word at the front; consumers take the next word from the
-/// back. Words are bytes: nothing is decoded, unquoted or unescaped.
+/// A word list holds its words in reverse order: the first word typed is the back of the list, the
+/// last word its front. Words are bytes, with no quoting, escapes or encoding.
 ///
-/// Pure functions: no state, no errors.
+/// The functions have no state and no errors.
 
-/// Takes the next word in typing order off `words`, which must not be empty.
+/// Removes the next word, the back, from `words`, which must not be empty, and returns it.
 std::string TakeNextWord(std::list<std::string>& words);
 
-/// The words of a typed line: its runs of characters that are not white space in the "C" locale.
+/// The words of a typed line, which white space of the "C" locale separates.
 std::list<std::string> convertLineToList(const std::string& line);
 
-/// Cuts `words` into command groups at each word that is exactly "--". The groups come in typing
-/// order; each is a word list again, and none is empty.
+/// Splits `words` into command groups at each word "--". The groups are in typing order; each is a
+/// word list, and none is empty.
 std::vector<std::list<std::string>> splitCmdList(std::list<std::string> words);
 
-/// The elements of a "cd" path, which slashes and white space separate, in typing order. A leading
-/// slash means nothing.
+/// The elements of a "cd" path, in typing order. Slashes and white space separate them; a leading
+/// slash has no meaning.
 std::vector<std::string> splitCmdPath(std::string path);

@@ -20,7 +20,7 @@ void ReadFlag(const lumo::object& reply, bool& flag) {
       lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), zub::kUnknown), flag);
 }
 
-/// Whether the baseband trace goes over QDSS. `query` asks for another property of that trace.
+/// Whether the baseband trace uses QDSS. `query` asks for another property of that trace.
 bool IsHighThroughputOn(const ManagerHandle& manager, lumo::dict query) {
   bool on = false;
   if (!TelephonyCapabilitiesRadioDIAGSupportsQDSS()) return on;
@@ -32,8 +32,8 @@ bool IsHighThroughputOn(const ManagerHandle& manager, lumo::dict query) {
   return on;
 }
 
-/// The request for a dump, as the option words ask for it and the device allows. `mode` is set to
-/// the packaging that it asks for.
+/// The request for a dump, with what the option words ask for and the device allows. Stores the
+/// packaging in `mode` as well.
 lumo::dict DumpRequest(const LogdumpCommand& node, const std::list<std::string>& words,
                        CompressionMode& mode) {
   mode = static_cast<CompressionMode>(defaults::compression::mode());
@@ -72,8 +72,8 @@ void PrintServerSuccess(const lumo::object& reply, CompressionMode mode, bool qd
   PrintLine("Path = " + buildLogPath(timestamp, mode, zub::trace::getBasebandTraceDirSuffix(qdss)));
 }
 
-/// Without a server nothing is packaged: the logs are in a snapshot folder, or still in the scratch
-/// folder of the trace.
+/// Without a server the logs are not packaged: they are in a snapshot folder, or still in the
+/// scratch folder of the trace.
 void PrintHelperSuccess(bool qdss) {
   const auto timestamp = AskHelperForTimestamp();
   PrintLine("Baseband log collection: Success (ZUB not running)");

@@ -4,10 +4,10 @@
 
 class LogdumpCommand;
 
-/// The handler that has the server dump the baseband trace logs, or, when no server runs, asks the
-/// helper service where they are. All its requests are synchronous; it does not use its task group.
-/// It returns false only when the query whether the baseband trace is enabled fails; every other
-/// failure shows in the printed lines.
+/// Returns the handler that asks the server to dump the baseband trace logs or, if no server runs,
+/// asks the helper service where they are. Its requests are synchronous; it does not use its task
+/// group. It returns false only if the query whether the trace is enabled fails; other failures are
+/// printed.
 ///
-/// `node` is the command that registers the handler and thereby owns it, so it outlives it.
+/// `node` is the command that registers the handler, and must outlive it.
 CommandHandler BasebandLogsHandler(const LogdumpCommand& node);

@@ -2,24 +2,24 @@
 
 #include "tool/ZUBCommandBase.h"
 
-/// What a refused handler prints on standard error.
+/// Printed on standard error when a handler is refused.
 inline constexpr auto kServerDownErrorPrint =
     "Server is not running. Please try after server starts.";
 
 /// The command `logdump`: the handlers `tel`, `core`, `bb` and `oslog`, which collect logs.
 class LogdumpCommand : public ZUBCommandBase {
  public:
-  /// Makes the node with its handlers.
+  /// Returns a new node with its handlers.
   static std::shared_ptr<CommandBase> create(const std::string& name,
                                              std::weak_ptr<CommandBase> parent,
                                              std::shared_ptr<zub::client::Manager> manager,
                                              dispatch::queue queue);
 
-  /// Refuses all handlers but `bb` while the server is not running.
+  /// Refuses every name but `bb` while the server is not running.
   bool isAllowed(std::string name) override;
 
-  /// Asks the server whether its system-logs trace runs in lite mode, and blocks until it has
-  /// answered. No usable answer counts as no.
+  /// Asks the server whether its system-logs trace is in lite mode and waits for the answer.
+  /// Returns false if there is no usable answer.
   bool isSystemLogsTraceLite() const;
 
  private:

@@ -4,14 +4,14 @@
 #include <list>
 #include <string>
 
-/// How collected logs are packaged. Sent to the server as a 64-bit integer.
+/// The packaging of collected logs.
 enum class CompressionMode : std::int32_t { none = 0, tarGz = 1, tar = 2 };
 
-/// Reads "[nocompress|tar.gz|tar] [nonui] <reason>" from the word list `words`. The option words
-/// come in any order and case, and may repeat; the first other word is the reason and ends the
-/// reading.
+/// Parses "[nocompress|tar.gz|tar] [nonui] <reason>" from the word list `words`. Options may be in
+/// any order and case and may repeat; the last packaging counts. The first other word is the
+/// reason; words after it are ignored.
 ///
-/// `mode` and `noUi` keep what the caller set where no option says otherwise; `reason` is always
-/// set. Cannot fail.
+/// Stores the packaging in `mode`, true in `noUi` for "nonui", and always a `reason`. `mode` and
+/// `noUi` stay as they are if there is no such option. Cannot fail.
 void parseLogdumpOptions(std::list<std::string> words, CompressionMode& mode, std::string& reason,
                          bool& noUi);

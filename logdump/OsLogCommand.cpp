@@ -12,14 +12,14 @@ namespace {
 
 using Words = std::list<std::string>;
 
-/// The whole number at the front of `word`, or 0, cut to the range of a signed 32-bit number.
+/// The integer at the start of `word`, or 0, clamped to the signed 32-bit range.
 double ReadSeconds(const std::string& word) {
   using Range = std::numeric_limits<std::int32_t>;
   const long long number = std::strtoll(word.c_str(), nullptr, 10);
   return static_cast<double>(std::clamp<long long>(number, Range::min(), Range::max()));
 }
 
-/// Sorts the words after "-p" and "-i"; words after any other option are dropped.
+/// Collects the words after "-p" and "-i". Words before these or after another option are ignored.
 void ParseSelection(Words words, Words& processes, Words& imagePaths) {
   Words* chosen = nullptr;
   while (!words.empty()) {

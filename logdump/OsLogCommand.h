@@ -2,8 +2,7 @@
 
 #include "framework/CommandBase.h"
 
-/// The handler that exports the recent system log of chosen processes into a text file, on the
-/// calling thread. Its words are the history in seconds, the file's path, and the processes and
-/// image paths after "-p" and "-i". A failure of the export itself shows in the result and, with
-/// its reason, in the system log.
+/// Returns the handler that exports the recent system log of selected processes to a text file. Its
+/// words are the history in seconds, the path of the file, processes after "-p" and image paths
+/// after "-i". It returns when the export has ended; the reason of a failure is in the system log.
 CommandHandler OsLogHandler();

@@ -9,7 +9,7 @@
 
 namespace {
 
-/// Where the two collections differ. There is one constant object for each.
+/// The differences between the two collections.
 struct Collection {
   const char* label;
   lumo::dict (*makeRequest)(const std::string& reason, CompressionMode mode);

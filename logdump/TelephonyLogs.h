@@ -4,11 +4,11 @@
 
 class LogdumpCommand;
 
-/// The handlers that have the server collect telephony logs. Each sends one request, returns true
-/// at once and prints the outcome, and the path on success, when the answer comes; its task group
-/// is open until then.
+/// Returns the handler that asks the server to collect telephony logs. It sends the request and
+/// returns true. When the reply arrives, it prints the outcome and, on success, the path, and
+/// leaves its task group.
 ///
-/// `node` is the command that registers the handler and thereby owns it, so it outlives it.
+/// `node` is the command that registers the handler, and must outlive it.
 CommandHandler TelephonyLogsHandler(const LogdumpCommand& node);
 
 /// The same with a core dump of the modem, which resets the baseband.

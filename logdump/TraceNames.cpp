@@ -6,7 +6,7 @@ namespace {
 
 bool IsKOV() { return TelephonyRadiosGetRadioVendor() == kTelephonyRadioVendorKOV; }
 
-/// The extension of an archive of that mode; `defaultSuffix` where there is none.
+/// The extension of an archive, or `defaultSuffix` if `mode` makes none.
 std::string ExtensionOf(CompressionMode mode, const std::string& defaultSuffix) {
   switch (mode) {
     case CompressionMode::tarGz:

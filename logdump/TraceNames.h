@@ -4,7 +4,7 @@
 
 #include "logdump/LogdumpOptions.h"
 
-/// Where collected logs are written, and how they are named. Both folders end with "/".
+/// Folders and names of collected logs. Both folders end with "/".
 namespace zub::trace {
 
 inline constexpr auto kScratchFolder = "/private/var/wireless/Library/Logs/ZubServer/";
@@ -16,12 +16,12 @@ inline constexpr auto kKOVTraceSnapshotDirectorySuffix = "-bb-trace";
 inline constexpr auto kZATTraceSnapshotDirectorySuffix = "-diag";
 inline constexpr auto kZATQDSSTraceSnapshotDirectorySuffix = "-qdss";
 
-/// The suffix of a snapshot folder on this radio; `qdss` says whether high-throughput tracing is
-/// on. Asks for the radio's vendor at every call.
+/// The suffix of a snapshot folder for this radio's vendor, which it asks for at every call.
+/// `qdss`: whether high-throughput tracing is on.
 std::string getBasebandTraceDirSuffix(bool qdss);
 
-/// The suffix of a core dump folder on this radio. The vendor is asked once, by the first call in
-/// the process; every later call gives the same text.
+/// The suffix of a core dump folder for this radio's vendor. The first call in the process asks for
+/// the vendor; later calls return the same text. Any thread.
 std::string getCoreDumpDirSuffix();
 
 }  // namespace zub::trace
@@ -33,7 +33,7 @@ inline constexpr auto kQDSSScratchDir = "QDSS.scratch";
 
 }  // namespace diag::config
 
-/// The path of the logs that the server has collected at `timestamp`. An archive's extension takes
-/// the place of `defaultSuffix`, which follows as it is when there is no archive. Cannot fail.
+/// The path of the logs that were collected at `timestamp`. It ends in the extension of the
+/// archive, or in `defaultSuffix` if `mode` makes none. Cannot fail.
 std::string buildLogPath(const std::string& timestamp, CompressionMode mode,
                          const std::string& defaultSuffix);

@@ -10,7 +10,7 @@
 
 namespace {
 
-/// The mode that a word means; none for any other text.
+/// The mode that a word stands for.
 std::optional<std::int32_t> ModeOfWord(const std::string& value) {
   static constexpr struct {
     const char* word;
@@ -23,8 +23,7 @@ std::optional<std::int32_t> ModeOfWord(const std::string& value) {
   return std::nullopt;
 }
 
-/// The base that the prefix of a number means. Not left to strtoll, which knows more prefixes in
-/// newer C libraries.
+/// The base of a number, from its prefix. strtoll accepts more prefixes in newer C libraries.
 int BaseOf(std::string_view number) {
   number.remove_prefix(std::min(number.find_first_not_of(" \t\n\v\f\r"), number.size()));
   if (number.starts_with('+') || number.starts_with('-')) number.remove_prefix(1);
@@ -32,7 +31,7 @@ int BaseOf(std::string_view number) {
   return number.starts_with('0') ? 8 : 10;
 }
 
-/// All of `value` as a signed 64-bit number.
+/// `value` as a signed 64-bit number, if all of it is one.
 std::optional<std::int64_t> ReadNumber(const std::string& value) {
   char* end = nullptr;
   errno = 0;

@@ -2,10 +2,11 @@
 
 #include "platform/lumo.h"
 
-/// Whether the baseband manager server runs, by its last report: false until it reports that it has
-/// started, and again once it reports any other state. Advisory: it orders no other memory access.
+/// Whether the baseband manager server runs, according to its last report; false before the first.
+/// Advisory: it orders no other memory access. Any thread.
 bool IsServerRunning();
 
-/// Sets that flag from the payload of a server-state event. Any state but exactly the started one,
-/// a malformed payload included, counts as not running. Called on the tool queue.
+/// Updates that from the payload of a server-state event. Any state other than
+/// `zub::kServerStateStarted`, and a malformed payload, means that the server does not run. Called
+/// on the tool queue.
 void SetServerState(const lumo::object& payload);

@@ -1,8 +1,7 @@
 #pragma once
 
-/// Returns the message that says why the tool cannot run on this device, or null when it can. The
-/// product must have a cellular radio and, unless it is a watch, a running telephony or baseband
-/// daemon.
+/// Returns the reason why the tool cannot run on this device, or null if it can. The product must
+/// have a cellular radio and, unless it is a watch, a running telephony or baseband daemon.
 const char* WhyNotToStart();
 
 namespace config::hw {

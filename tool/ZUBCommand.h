@@ -2,10 +2,10 @@
 
 #include "tool/ZUBCommandBase.h"
 
-/// The root of the tool's command tree. It has one sub-command, `logdump`, and allows everything.
+/// The root of the tool's command tree. Its only sub-command is `logdump`.
 class ZUBCommand : public ZUBCommandBase {
  public:
-  /// Makes the root and the tree below it.
+  /// Returns a new root with its whole tree.
   static std::shared_ptr<CommandBase> create(const std::string& name,
                                              std::weak_ptr<CommandBase> parent,
                                              std::shared_ptr<zub::client::Manager> manager,

@@ -3,9 +3,8 @@
 #include "framework/CommandBase.h"
 #include "platform/zub_client.h"
 
-/// A command node of the tool: it can talk to the server, and so can the children that it makes.
-///
-/// The manager and the queue are shared by all nodes and live at least as long as any of them.
+/// A command node of the tool, which can talk to the server. All nodes share one manager and one
+/// queue.
 class ZUBCommandBase : public CommandBase {
  public:
   const std::shared_ptr<zub::client::Manager> manager;

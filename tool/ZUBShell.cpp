@@ -12,20 +12,19 @@ namespace {
 
 constexpr auto kFirstStateWait = std::chrono::milliseconds(500);
 
-/// Has the server's state followed from now on. Each live reference to the event handler, the
-/// library's own included, is a member of `group`.
+/// Subscribes to the server's state. Each copy of the event handler is a member of `group`.
 void FollowServerState(const std::shared_ptr<zub::client::Manager>& manager,
                        const dispatch::group& group) {
   const zub::client::EventHandler handler =
       [manager, member = dispatch::membership(group)](
           const lumo::object& payload, const dispatch::group&) { SetServerState(payload); };
   zub::client::RegisterEventHandler(manager, zub::kEventServerStateChange, handler);
-  // Off and on again: a server that has reported its state before then reports it anew.
+  // Off and on again, so that a server which has already reported its state reports it once more.
   zub::client::EventsOff(manager);
   zub::client::EventsOn(manager);
 }
 
-/// Connects to the server and builds the tree over that connection.
+/// Connects to the server and builds the tree on that connection.
 std::shared_ptr<CommandBase> Connect() {
   const dispatch::queue queue("zubtool.queue");
   const auto manager = zub::client::CreateManager("zubtool", queue);
@@ -34,8 +33,8 @@ std::shared_ptr<CommandBase> Connect() {
     const dispatch::membership own(group);
     FollowServerState(manager, group);
   }
-  // A library that keeps the handler keeps the group open, and the wait lasts its full time. Either
-  // way the tool starts: commands that need the server ask for its state themselves.
+  // If the library keeps the handler, the group stays open and the wait takes its full time. The
+  // result does not matter: commands that need the server check its state.
   static_cast<void>(group.wait(kFirstStateWait));
   return ZUBCommand::create(getprogname(), {}, manager, queue);
 }

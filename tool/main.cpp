@@ -15,21 +15,21 @@ namespace {
 
 constexpr int kCannotStart = -1;  // status 255
 
-/// Ends a start for which there is too little memory: there may be none for an exception either.
+/// Ends the process when memory runs out at the start: an exception would need memory too.
 [[noreturn]] void RefuseToStart() {
   std::cerr << "Cannot start: not enough memory" << std::endl;
   std::exit(kCannotStart);
 }
 
-/// What the shell thread is given by the main thread, and outlives it.
+/// What the main thread passes to the shell thread, and which outlives that.
 struct Start {
-  std::list<std::string> words;
-  sigset_t signals{};  ///< blocked when the process was started
+  std::list<std::string> words;  ///< of the command line
+  sigset_t signals{};            ///< blocked when the process was started
 };
 
-/// The shell thread. `given` is its `Start`.
-extern "C" void* runShellThread(void* given) {
-  const auto& start = *static_cast<const Start*>(given);
+/// The shell thread. `argument` is its `Start`.
+extern "C" void* runShellThread(void* argument) {
+  const auto& start = *static_cast<const Start*>(argument);
   pthread_sigmask(SIG_SETMASK, &start.signals, nullptr);
   try {
     const auto commandLine = start.words;
@@ -53,7 +53,7 @@ int main(int argc, char** argv) {
     return kCannotStart;
   }
   std::set_new_handler(nullptr);  // from here on it is an exception
-  // Signals are the shell thread's. Blocked before it starts, none is taken here meanwhile.
+  // Only the shell thread takes signals. They are blocked before it starts; it restores the mask.
   sigset_t all;
   sigfillset(&all);
   pthread_sigmask(SIG_BLOCK, &all, &start.signals);
