@@ -75,13 +75,9 @@ struct Script {
   std::thread thread;
   OSLogDate start{0};
 
-  std::mutex mutex;
   std::vector<std::string> calls;
-
-  void note(const std::string& call) {
-    const std::lock_guard lock(mutex);
-    calls.push_back(call);
-  }
+  std::mutex mutex;
+  std::vector<std::string> errors;  ///< what stands in the system log, but for the start of each
 };
 
 Script* script = nullptr;
@@ -89,23 +85,24 @@ Script* script = nullptr;
 class ScriptedStream : public OSLogEventStream {
  public:
   void setFlags(std::uint64_t flags) override {
-    script->note("flags " + std::to_string(flags) + " file:" + readFile(script->watched));
+    script->calls.push_back("flags " + std::to_string(flags) +
+                            " file:" + readFile(script->watched));
   }
   void setFilterPredicate(OSLogOrPredicate predicate) override {
     std::string filter = "filter ";
     for (const auto& [format, value] : predicate.terms) filter += format + " " + value + "; ";
-    script->note(filter);
+    script->calls.push_back(filter);
   }
   void setEventHandler(EventHandler handler) override {
-    script->note("event handler");
+    script->calls.push_back("event handler");
     onEvent = std::move(handler);
   }
   void setInvalidationHandler(InvalidationHandler handler) override {
-    script->note("invalidation handler");
+    script->calls.push_back("invalidation handler");
     onEnd = std::move(handler);
   }
   void activateStreamFromDate(OSLogDate date) override {
-    script->note("activate");
+    script->calls.push_back("activate");
     script->start = date;
     script->thread = std::thread([deliver = onEvent, end = onEnd] {
       for (const auto& event : script->events) deliver(Event(event));
@@ -123,7 +120,7 @@ class ScriptedStream : public OSLogEventStream {
 
 class ScriptedStore : public OSLogEventStore {
   void prepareWithCompletionHandler(PrepareHandler handler) override {
-    script->note("prepare file:" + readFile(script->watched));
+    script->calls.push_back("prepare file:" + readFile(script->watched));
     const auto succeed = [handler] { handler(std::make_shared<OSLogEventSource>(), std::nullopt); };
     if (script->prepare == Script::Prepare::comesLate) {
       script->thread = std::thread([succeed] {  // which learns of nothing else that was done
@@ -151,17 +148,6 @@ class OsLogStreamTest : public ::testing::Test, public Script {
     return OsLogStreamClock::put(timeout, output);
   }
 
-  /// What stands in the system log, but for the line that each export writes.
-  std::vector<std::string> diagnostics() {
-    const std::lock_guard lock(mutex);
-    std::vector<std::string> found;
-    for (const auto& call : calls) {
-      if (call.starts_with("error: ") && !call.starts_with("error: Getting"))
-        found.push_back(call.substr(7));
-    }
-    return found;
-  }
-
   ScratchFolder folder;
   std::string output;
   const std::string line = "1970-01-01 00:00:00 +0000 0x00000 0x0 0 proc(image):sub.sys [cat] m\n";
@@ -178,7 +164,7 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
             (Texts{"prepare file:old", "flags 21 file:",
                    "filter process == %@ p1; process == %@ p2; senderImagePath CONTAINS[cd] %@ I; ",
                    "event handler", "invalidation handler",
-                   "error: Getting oslog stream: history = 3600.000000", "activate"}));
+                   "Getting oslog stream: history = 3600.000000", "activate"}));
   EXPECT_GE(start, before.addingSeconds(-3600));
   EXPECT_LE(start, OSLogDate::now().addingSeconds(-3600));
   EXPECT_EQ(readFile(output), line);
@@ -186,7 +172,7 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
 }
 
 TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
-  const std::string history = "error: Getting oslog stream: history = ";
+  const std::string history = "Getting oslog stream: history = ";
   forEachRow("oslog-command", 3, [&](const Row& row) {
     calls.clear();
     auto words = convertLineToList(row[0]);
@@ -217,29 +203,29 @@ TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {
             "proc(image):sub.sys [cat] " +
                 message + "\n");
   EXPECT_EQ(std::filesystem::status(output).permissions(), std::filesystem::perms(0600));
-  EXPECT_EQ(diagnostics(), Texts());
+  EXPECT_EQ(errors, Texts());
 }
 
 TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
   prepare = Prepare::fails;
   EXPECT_FALSE(put());
-  EXPECT_EQ(diagnostics(), (Texts{"Could not open: locked", "Failed to prepare oslog stream"}));
+  EXPECT_EQ(errors, (Texts{"Could not open: locked", "Failed to prepare oslog stream"}));
   EXPECT_NE(access(output.c_str(), F_OK), 0) << "the file is made only for a stream";
-  calls.clear();
+  errors.clear();
   prepare = Prepare::comesLate;
   EXPECT_FALSE(put());
   stopped.store(true, std::memory_order_relaxed);
   thread.join();
-  EXPECT_EQ(diagnostics(), Texts{"Failed to prepare oslog stream"});
+  EXPECT_EQ(errors, Texts{"Failed to prepare oslog stream"});
   prepare = Prepare::succeeds;
   const int sealed = memfd_create("", MFD_CLOEXEC | MFD_ALLOW_SEALING);
   const auto onlyGrowing = "/proc/self/fd/" + std::to_string(sealed);
   writeFile(onlyGrowing, "old");
   ASSERT_EQ(fcntl(sealed, F_ADD_SEALS, F_SEAL_SHRINK), 0);
   for (const auto& path : {folder.path("no/such"), onlyGrowing, output + std::string("\0cut", 4)}) {
-    calls.clear();
+    errors.clear();
     EXPECT_FALSE(OsLogStreamClock::put(60s, path));
-    EXPECT_EQ(diagnostics(), Texts{"Failed to create file: " + path});
+    EXPECT_EQ(errors, Texts{"Failed to create file: " + path});
   }
   EXPECT_EQ(readFile(onlyGrowing), "old");
   close(sealed);
@@ -248,18 +234,18 @@ TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
 TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
   reason = 7;
   EXPECT_TRUE(put()) << "the log store ended the stream, for whatever reason";
-  EXPECT_EQ(diagnostics(), Texts{"Invalid oslog stream: reason = 7"});
+  EXPECT_EQ(errors, Texts{"Invalid oslog stream: reason = 7"});
   thread.join();
   events.resize(3);
   for (const auto& [path, message, why] :
        {std::array{"/dev/full", "m", "No space left on device"},
         std::array{"/dev/null", "too long", "Cannot allocate memory"}}) {
-    calls.clear();
+    errors.clear();
     output = path;
     events[0].message = message;
     EXPECT_FALSE(put());
-    EXPECT_EQ(diagnostics(), (Texts{"Failed to write file: " + output + ": " + why,
-                                    "Invalid oslog stream: reason = 1"}));
+    EXPECT_EQ(errors, (Texts{"Failed to write file: " + output + ": " + why,
+                             "Invalid oslog stream: reason = 1"}));
     invalidated = false;
     thread.join();
   }
@@ -279,9 +265,8 @@ TEST_F(OsLogStreamTest, GivesUpOnAStreamThatDoesNotEndAndWritesNoMoreOfIt) {
   const auto later = readFile(output);
   EXPECT_LE(later.size(), written.size() + line.size()) << "but for a line that was under way";
   EXPECT_TRUE(later.ends_with(line));
-  auto found = diagnostics();  // written by two threads
-  std::ranges::sort(found);
-  EXPECT_EQ(found, (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
+  std::ranges::sort(errors);  // written by two threads
+  EXPECT_EQ(errors, (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
 }
 
 TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
@@ -318,6 +303,9 @@ std::shared_ptr<OSLogEventStream> OSLogEventStream::initWithSource(
   return std::make_shared<ScriptedStream>();
 }
 
-void platform::logError(const std::string& message) { script->note("error: " + message); }
+void platform::logError(const std::string& message) {
+  const std::lock_guard lock(script->mutex);
+  (message.starts_with("Getting ") ? script->calls : script->errors).push_back(message);
+}
 
 bool posix::isReadByDevice(const std::string& /*path*/) { return false; }
