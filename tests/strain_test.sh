@@ -67,8 +67,12 @@ for ((kib = 4096; kib < 65536; kib += 16)); do
   ! grep -q 'shell thread' errors || ((kib += 496))  # from here on it lacks whole stacks
   status=0
   (ulimit -v $kib && exec "$program" back) >out 2>err || status=$?
-  [[ $status =~ ^(1|127|255)$ && -s err && ! -s out ]] || fail "with $kib KiB: status $status"  # 127: the loader's
   cat err >>errors
+  read -r why <err || true
+  [[ ! -s out && "$status $why" =~ ^(127 |255 Cannot start|1 Not enough memory$|1 Cannot connect) ]] ||  # 127: the loader's
+    fail "with $kib KiB: status $status: $why"
 done
-grep -qx 'Cannot start: not enough memory' errors && grep -q 'Cannot connect to the server: ' errors ||
-  fail "memory is never too little to start"
+for refusal in 'Cannot start: not enough memory' \
+  'Cannot '{'start the shell thread','connect to the server'}': Resource temporarily unavailable'; do
+  grep -qx "$refusal" errors || fail "never: $refusal"
+done
