@@ -20,19 +20,18 @@ int answer(const std::string& question, int with) {
 }
 
 TEST(StartUpChecks, AskInTheirOrderAndNotMoreThanTheyMust) {
-  for (const auto& [radio, running, asked] : {std::tuple(0, "Orvalind", "radio "),
-                                              {1, "Orvalind", "radio Orvalind product "},
-                                              {1, "modemd", "radio Orvalind product modemd "}}) {
-    device = {radio, 0, running, ""};
-    EXPECT_EQ(WhyNotToStart() == nullptr, radio == 1) << asked;
-    EXPECT_EQ(device.asked, asked);
-  }
   for (int product = 0; product < 60; ++product) {
-    device = {1, product, "", ""};
-    const bool isWatch = product >= 32 && product < 46;
-    EXPECT_EQ(WhyNotToStart() == nullptr, isWatch) << product;
-    EXPECT_EQ(device.asked, isWatch ? "radio Orvalind product " : "radio Orvalind product modemd ");
+    for (const std::string running : {"", "Orvalind", "modemd"}) {
+      device = {1, product, running, ""};
+      const bool isWatch = product >= 32 && product < 46;
+      const bool isEnough = isWatch || running == "Orvalind";
+      EXPECT_EQ(WhyNotToStart() == nullptr, isEnough || running == "modemd") << product << running;
+      EXPECT_EQ(device.asked, std::string("radio Orvalind product ") + (isEnough ? "" : "modemd "));
+    }
   }
+  device = {0, 32, "Orvalind", ""};
+  EXPECT_TRUE(WhyNotToStart());
+  EXPECT_EQ(device.asked, "radio ");
 }
 
 }  // namespace

@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include <atomic>
+#include <optional>
 #include <thread>
 
 #include "platform/zub_client.h"
@@ -63,27 +63,21 @@ TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
   const auto asked = zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty,
                                                  propertyRequest(zub::kKeyTraceMode), &reply);
   if (asked.code == zub::kResultServerNotRunning) GTEST_SKIP() << "there is no server";
-  struct Seen {
-    dispatch::group reported = dispatch::group::create();
-    std::atomic<bool> open = true;
-    std::atomic<std::thread::id> thread;
-  };
-  const auto seen = std::make_shared<Seen>();
-  seen->reported.enter();
+  const auto reported = dispatch::group::create();
+  const auto pending = std::make_shared<std::optional<dispatch::membership>>(reported);
   zub::client::EventsOff(manager);
   settle();
   zub::client::RegisterEventHandler(
-      manager, zub::kEventServerStateChange, [seen](const lumo::object& payload, const auto&) {
+      manager, zub::kEventServerStateChange,
+      [pending, expected = thread](const lumo::object& payload, const auto&) {
         EXPECT_TRUE(!payload.isDict() || payload.get(zub::kKeyServerState).as<std::string>());
-        seen->thread = std::this_thread::get_id();
-        if (seen->open.exchange(false)) seen->reported.leave();
+        EXPECT_EQ(std::this_thread::get_id(), expected);
+        pending->reset();
       });
   settle();
-  EXPECT_TRUE(seen->open) << "events are off";
+  EXPECT_FALSE(reported.wait(0ns)) << "events are off";
   zub::client::EventsOn(manager);
-  EXPECT_GT(seen.use_count(), 1);  // the handler is kept
-  ASSERT_TRUE(seen->reported.wait(60s));
-  EXPECT_EQ(seen->thread.load(), thread);
+  EXPECT_TRUE(reported.wait(60s));
 }
 
 }  // namespace
