@@ -39,10 +39,6 @@ TEST(Program, ExportsTheLogOfARealMachine) {
   EXPECT_EQ(readFile(folder.path("out")), readFile(data + "txt"));
   expectOutcome(run({{"logdump", "oslog", "600", folder.path("out")}}), {});
   EXPECT_EQ(std::ranges::count(readFile(folder.path("out")), '\n'), 6) << "of the sample";
-  const auto own = folder.path("own");
-  writeFile(own, readFile(data + "export"));
-  expectOutcome(run({{"logdump", "oslog", "600", own}, "log = " + own}), {.status = 1});
-  EXPECT_EQ(readFile(own), readFile(data + "export")) << "the log is no place to export it to";
 }
 
 TEST(Program, ReportsErrorsToTheSystemLog) {
