@@ -1,6 +1,7 @@
 #include "logdump/TelephonyLogs.h"
 
 #include <iostream>
+#include <new>
 
 #include "logdump/LogdumpCommand.h"
 #include "logdump/LogdumpOptions.h"
@@ -46,8 +47,13 @@ void PrintOutcome(const Collection& collection, CompressionMode mode,
   const bool succeeded = result.code == 0;
   std::cout << collection.label << (succeeded ? "Success" : "Failed") << std::endl;
   if (!succeeded || !reply.isDict()) return;
-  const auto timestamp = lumo::dyn_cast_or_default(reply.get(zub::kKeyTimestampString), "");
-  std::cout << "Path = " << buildLogPath(timestamp, mode, collection.defaultSuffix()) << std::endl;
+  try {
+    const auto timestamp = lumo::dyn_cast_or_default(reply.get(zub::kKeyTimestampString), "");
+    std::cout << "Path = " << buildLogPath(timestamp, mode, collection.defaultSuffix())
+              << std::endl;
+  } catch (const std::bad_alloc&) {  // a completion must not throw
+    std::cerr << "Not enough memory" << std::endl;
+  }
 }
 
 bool Collect(const LogdumpCommand& node, const Collection& collection, const dispatch::group& group,

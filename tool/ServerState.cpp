@@ -13,6 +13,6 @@ std::atomic<bool> gServerRunning = false;
 bool IsServerRunning() { return gServerRunning.load(std::memory_order_relaxed); }
 
 void SetServerState(const lumo::object& payload) {
-  const auto state = lumo::dyn_cast_or_default(payload.get(zub::kKeyServerState), "");
-  gServerRunning.store(state == zub::kServerStateStarted, std::memory_order_relaxed);
+  const auto* const state = payload.get(zub::kKeyServerState).as<std::string>();
+  gServerRunning.store(state && *state == zub::kServerStateStarted, std::memory_order_relaxed);
 }
