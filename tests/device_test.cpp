@@ -1,7 +1,6 @@
 // The simulated device, its profile, and what it takes from this machine.
 
 #include <gtest/gtest.h>
-#include <pthread.h>
 #include <sys/prctl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
@@ -9,6 +8,7 @@
 
 #include <csignal>
 #include <filesystem>
+#include <new>
 #include <sstream>
 #include <thread>
 
@@ -16,8 +16,12 @@
 #include "platform/host/device/RequestLog.h"
 #include "platform/telephony.h"
 #include "platform/zub_client.h"
+#include "tests/CapturedOutput.h"
+#include "tests/FailingAllocations.h"
 #include "tests/Program.h"
 #include "tests/Table.h"
+#include "tool/ServerState.h"
+#include "tool/ZUBCommand.h"
 
 using namespace std::chrono_literals;
 
@@ -139,24 +143,38 @@ TEST(Server, IsAskedAndTakesHandlersWhileItsStateChanges) {
   use();
 }
 
-TEST(Server, FailsADumpForWhichThereIsNoThread) {
-  host::device().dumpDelay = 1h;
-  const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
-  const auto group = dispatch::group::create();
-  std::int32_t code = 0;
-  pthread_attr_t before{};
-  pthread_getattr_default_np(&before);
-  pthread_attr_t huge{};
-  pthread_attr_init(&huge);
-  pthread_attr_setstacksize(&huge, ~std::size_t{0xFFFFFFF});  // of any width, nearly all memory
-  ASSERT_EQ(pthread_setattr_default_np(&huge), 0);
-  zub::client::PerformCommand(manager, zub::kCommandTraceDumpState,
-                              [&code, member = dispatch::membership(group)](
-                                  const auto& result, const auto&) { code = result.code; },
-                              {});
-  pthread_setattr_default_np(&before);
-  EXPECT_TRUE(group.wait(60s));
-  EXPECT_NE(code, 0);
+TEST(Server, OutlivesEachAllocationOfACollectionThatFails) {
+  const dispatch::queue queue("test");
+  host::device().server = {{0ms, "a state that takes memory"}};
+  const auto followed = zub::client::CreateManager("followed", queue);
+  host::device().server = {{0ms, "Started"}};
+  zub::client::RegisterEventHandler(
+      followed, zub::kEventServerStateChange,
+      [](const lumo::object& payload, const auto&) { SetServerState(payload); });
+  for (const std::string handler : {"tel", "core", "bb"}) {
+    bool failed = true;
+    for (int nth = 1; failed; ++nth) {
+      const CapturedOutput out;
+      std::cout << "this takes the memory for all of the output" << std::endl;
+      bool succeeded = false;
+      {
+        const FailingAllocation failing(nth);
+        try {
+          zub::client::EventsOff(followed);
+          zub::client::EventsOn(followed);
+          const auto manager = zub::client::CreateManager("test", queue);
+          const auto root = ZUBCommand::create("zubtool", {}, manager, queue);
+          succeeded = root->getSubCommandObj("logdump")->execCommand(handler, {"reason"});
+        } catch (const std::bad_alloc&) {
+          succeeded = false;
+        }
+        failed = FailingAllocation::hasFailed();
+      }
+      const std::string said = out.str();
+      EXPECT_TRUE(!succeeded || said.find("og collection") != std::string::npos) << handler;
+      EXPECT_TRUE(failed || said.find("\n$Path = ") != std::string::npos) << said;
+    }
+  }
 }
 
 }  // namespace

@@ -2,7 +2,7 @@
 
 #include <map>
 #include <mutex>
-#include <system_error>
+#include <new>
 #include <thread>
 #include <utility>
 #include <vector>
@@ -66,10 +66,14 @@ class Manager {
     if (on && wereOff && !state.empty()) reportState();
   }
 
-  void enterState(const std::string& entered) {
+  /// An event for which there is no memory is lost.
+  void enterState(std::string entered) noexcept {
     const std::lock_guard lock(mutex);
-    state = entered;
-    if (eventsOn) reportState();
+    state = std::move(entered);
+    try {
+      if (eventsOn) reportState();
+    } catch (const std::bad_alloc&) {
+    }
   }
 
   bool isServerRunning() {
@@ -83,7 +87,9 @@ class Manager {
     payload.set(kKeyServerState, state);
     const auto [first, last] = handlers.equal_range(kEventServerStateChange);
     for (auto handler = first; handler != last; ++handler) {
-      queue.async([call = handler->second, payload] { call(payload, dispatch::group::create()); });
+      queue.async([call = handler->second, payload]() mutable {
+        call(std::move(payload), dispatch::group::create());
+      });
     }
   }
 
@@ -112,17 +118,16 @@ void startServer(const std::shared_ptr<Manager>& manager) {
   for (; next != steps.end() && next->at.count() == 0; ++next) manager->enterState(next->state);
   steps.erase(steps.begin(), next);
   if (steps.empty()) return;
-  const posix::SignalsBlocked onTheThread;
-  std::thread([manager, start, steps] {
-    for (const auto& step : steps) {
+  std::thread([manager, start, steps = std::move(steps)]() mutable {
+    for (auto& step : steps) {
       std::this_thread::sleep_until(start + step.at);
-      manager->enterState(step.state);
+      manager->enterState(std::move(step.state));
     }
   }).detach();
 }
 
 constexpr std::int32_t kNoSuchRequest = -1;
-constexpr std::int32_t kNoThread = -2;
+constexpr std::int32_t kNoMemory = -2;
 
 TelephonyLumo::Result answerTraceProperty(const lumo::dict& request, lumo::object* reply) {
   const auto& device = host::device();
@@ -142,30 +147,41 @@ TelephonyLumo::Result answerTraceProperty(const lumo::dict& request, lumo::objec
   return {kNoSuchRequest, "no such trace property"};
 }
 
-/// What is settled when a request arrives: the rest of its answer may take time.
-struct Arrival {
+/// A request that has arrived. Whether the server runs is settled by then.
+struct Request {
+  std::string command;
+  lumo::dict entries;
   bool serverRuns;
-  std::chrono::milliseconds delay;
 };
 
-/// Notes the request. Trace properties are settings of the device, answered without a server.
-Arrival arrive(Manager& manager, const std::string& command, const lumo::dict& request) {
-  host::recordRequest(command + " " + host::describe(request));
-  const bool isDump = command == kCommandTraceDumpState;
-  const bool serverRuns = manager.isServerRunning();
-  return {serverRuns,
-          isDump && serverRuns ? host::device().dumpDelay : std::chrono::milliseconds()};
+Request arrive(Manager& manager, const std::string& command, const lumo::dict& entries) {
+  host::recordRequest(command + " " + host::describe(entries));
+  return {command, entries, manager.isServerRunning()};
 }
 
-TelephonyLumo::Result answer(const Arrival& arrival, const std::string& command,
-                             const lumo::dict& request, lumo::object* reply) {
-  if (command == kCommandGetTraceProperty) return answerTraceProperty(request, reply);
-  if (!arrival.serverRuns) return {kResultServerNotRunning, "the server is not running"};
-  if (command != kCommandTraceDumpState) return {kNoSuchRequest, "no such command"};
+/// Takes as long as the server does. Trace properties are settings of the device, answered without
+/// a server.
+TelephonyLumo::Result answer(const Request& request, lumo::object* reply) {
+  if (request.command == kCommandGetTraceProperty) {
+    return answerTraceProperty(request.entries, reply);
+  }
+  if (!request.serverRuns) return {kResultServerNotRunning, "the server is not running"};
+  if (request.command != kCommandTraceDumpState) return {kNoSuchRequest, "no such command"};
   const auto& device = host::device();
+  std::this_thread::sleep_for(device.dumpDelay);
   return host::answerWith(device.dump, kKeyTimestampString, host::timestampOr(device.dumpTimestamp),
                           reply);
 }
+
+/// The answer to a request that is under way on the queue. A task takes the completion from here,
+/// and so releases it after its call.
+struct Pending {
+  Completion completion;
+  TelephonyLumo::Result result;
+  lumo::object reply;
+
+  void complete() { std::exchange(completion, {})(std::move(result), std::move(reply)); }
+};
 
 }  // namespace
 
@@ -187,35 +203,24 @@ void EventsOn(std::shared_ptr<Manager> manager) { manager->switchEvents(true); }
 
 TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                                      const lumo::dict& request, lumo::object* reply) {
-  const auto arrival = arrive(*manager, command, request);
-  std::this_thread::sleep_for(arrival.delay);
-  return answer(arrival, command, request, reply);
+  return answer(arrive(*manager, command, request), reply);
 }
 
 void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request) {
-  const auto arrival = arrive(*manager, command, request);
-  // Held in one place, from which the queue's task takes it: it is released there, after its call.
-  const auto held = std::make_shared<Completion>(std::move(completion));
-  const auto complete = [held](const TelephonyLumo::Result& result, const lumo::object& reply) {
-    std::exchange(*held, {})(result, reply);
-  };
-  const dispatch::block<void()> task = [=] {
-    lumo::object reply;
-    const auto result = answer(arrival, command, request, &reply);
-    complete(result, reply);
-  };
-  if (arrival.delay.count() == 0) return manager->queue.async(task);
-  const posix::SignalsBlocked onTheThread;
-  try {
-    std::thread([queue = manager->queue, delay = arrival.delay, task] {
-      std::this_thread::sleep_for(delay);
-      queue.async(task);
-    }).detach();
-  } catch (const std::system_error& failure) {
-    const TelephonyLumo::Result result = {kNoThread, failure.what()};
-    manager->queue.async([=] { complete(result, {}); });
-  }
+  const auto pending = std::make_shared<Pending>();
+  pending->completion = std::move(completion);
+  manager->queue.async([manager, pending, arrived = arrive(*manager, command, request)] {
+    try {
+      pending->result = answer(arrived, &pending->reply);
+      // After the events of the time that the answer took.
+      manager->queue.async([pending] { pending->complete(); });
+    } catch (const std::bad_alloc&) {
+      pending->result = {kNoMemory, "no memory"};
+      pending->reply = {};
+      pending->complete();
+    }
+  });
 }
 
 }  // namespace client

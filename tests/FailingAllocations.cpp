@@ -1,0 +1,28 @@
+#include "tests/FailingAllocations.h"
+
+#include <atomic>
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+std::atomic<int> left =
+    -1;  // allocations up to the one that fails, 0 after it; -1: none is to fail
+
+}  // namespace
+
+FailingAllocation::FailingAllocation(int nth) { left = nth; }
+FailingAllocation::~FailingAllocation() { left = -1; }
+bool FailingAllocation::hasFailed() { return left == 0; }
+
+void* operator new(std::size_t size) {
+  int before = left;
+  while (before > 0 && !left.compare_exchange_weak(before, before - 1)) {
+  }
+  void* const memory = before == 1 ? nullptr : std::malloc(size > 0 ? size : 1);
+  if (!memory) throw std::bad_alloc();
+  return memory;
+}
+
+void operator delete(void* memory) noexcept { std::free(memory); }
+void operator delete(void* memory, std::size_t) noexcept { std::free(memory); }
