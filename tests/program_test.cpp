@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <csignal>
 #include <cstdlib>
 #include <cstring>
 
@@ -27,6 +28,21 @@ TEST(Program, FollowsTheServerWhileItPrompts) {
   EXPECT_GT(refused, 0);
   EXPECT_EQ(std::ranges::count(outcome.err, '\n'), refused);
   EXPECT_EQ(std::ranges::count(outcome.requests, '\n'), 1);
+}
+
+TEST(Program, TakesSignalsOnOneThread) {
+  Program program({.profile = "server = 0 Started, 60000 Stopped"});  // on a thread of its own
+  EXPECT_EQ(program.readUntil(kPrompt), kPrompt);
+  std::vector<bool> blocks;
+  const auto tasks = "/proc/" + std::to_string(program.pid()) + "/task";
+  for (const auto& task : std::filesystem::directory_iterator(tasks)) {
+    const auto status = readFile(task.path() / "status");
+    const auto mask = std::stoull(status.substr(status.find("SigBlk:") + 7), nullptr, 16);
+    blocks.push_back((mask & 1ULL << (SIGTERM - 1)) != 0);
+  }
+  EXPECT_GE(blocks.size(), 4U);
+  EXPECT_EQ(std::ranges::count(blocks, false), 1);
+  program.finish();
 }
 
 TEST(Program, ExportsTheLogOfARealMachine) {
