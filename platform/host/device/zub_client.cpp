@@ -118,6 +118,7 @@ void startServer(const std::shared_ptr<Manager>& manager) {
   for (; next != steps.end() && next->at.count() == 0; ++next) manager->enterState(next->state);
   steps.erase(steps.begin(), next);
   if (steps.empty()) return;
+  const posix::SignalsBlocked onTheThread;
   std::thread([manager, start, steps = std::move(steps)]() mutable {
     for (auto& step : steps) {
       std::this_thread::sleep_until(start + step.at);
