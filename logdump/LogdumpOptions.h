@@ -4,7 +4,7 @@
 #include <list>
 #include <string>
 
-/// The packaging of collected logs.
+/// The packaging of collected logs. The values are those of the server.
 enum class CompressionMode : std::int32_t { none = 0, tarGz = 1, tar = 2 };
 
 /// Parses "[nocompress|tar.gz|tar] [nonui] <reason>" from the word list `words`. Options may be in

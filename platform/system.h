@@ -12,7 +12,7 @@ extern "C" const char* getprogname();
 namespace platform {
 
 /// Runs the event loop of the main thread, the only one to call it, and serves the platform's
-/// callbacks. In practice it does not return.
+/// callbacks. Called with all signals blocked. In practice it does not return.
 void runMainEventLoop();
 
 /// Makes the standard streams safe to use, before anything else is opened and while there is one
