@@ -8,8 +8,8 @@
 
 #include <csignal>
 #include <filesystem>
+#include <map>
 #include <new>
-#include <sstream>
 #include <thread>
 
 #include "platform/host/device/Device.h"
@@ -60,13 +60,13 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
 }
 
 TEST(Profile, KnowsProductsByName) {
-  std::istringstream products(
-      "Unknown 0 Phone 1 PhoneLarge 2 Tablet 16 TabletLarge 17 Watch1Small 32 Watch1Large 33 "
-      "Watch2Small 34 Watch2Large 35 Watch3Small 36 Watch3Large 37 Watch4Small 38 Watch4Large 39 "
-      "Watch5Small 40 Watch5Large 41 Watch6Small 42 Watch6Large 43 Watch7Small 44 Watch7Large 45");
-  Profile profile;
-  int code = 0;
-  for (std::string name; products >> name >> code;) {
+  std::map<std::string, int> products = {
+      {"Unknown", 0}, {"Phone", 1}, {"PhoneLarge", 2}, {"Tablet", 16}, {"TabletLarge", 17}};
+  for (int i = 0; i < 14; ++i) {
+    products["Watch" + std::to_string(1 + i / 2) + (i % 2 == 0 ? "Small" : "Large")] = 32 + i;
+  }
+  for (const auto& [name, code] : products) {
+    Profile profile;
     EXPECT_EQ(parse("product = " + name, profile), "good");
     EXPECT_EQ(profile.product, code) << name;
   }

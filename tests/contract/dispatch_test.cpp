@@ -24,6 +24,9 @@ TEST(Group, IsOpenAsLongAsAnyMembershipLives) {
   EXPECT_FALSE(group.wait(0ns));
   moved.reset();
   EXPECT_TRUE(group.wait(0ns));
+  EXPECT_DEATH(group.leave(), "");
+  const dispatch::membership ofNone((dispatch::group()));
+  dispatch::queue().async([] { FAIL() << "there is no queue"; });
 }
 
 TEST(Group, WaitEndsWithTheLastLeaveOnAnotherThread) {
@@ -32,7 +35,7 @@ TEST(Group, WaitEndsWithTheLastLeaveOnAnotherThread) {
     std::atomic<int> ended = 0;
     const std::jthread one([&ended, member = dispatch::membership(group)] { ++ended; });
     const std::jthread other([&ended, member = dispatch::membership(group)] { ++ended; });
-    group.wait();
+    EXPECT_TRUE(group.wait(std::chrono::nanoseconds::max()));
     EXPECT_EQ(ended, 2);
   }
 }
@@ -50,8 +53,9 @@ TEST(Queue, RunsTasksInOrderAndReleasesEachBeforeTheNext) {
   const auto group = dispatch::group::create();
   const auto owned = std::make_shared<int>(0);
   std::vector<int> order;
+  char label[64] = {};
   {
-    const dispatch::queue queue("order");
+    const dispatch::queue queue("a label of any length");
     for (int i = 0; i < 1000; ++i) {
       queue.async([&order, i, owned, member = dispatch::membership(group)] { order.push_back(i); });
     }
@@ -60,9 +64,11 @@ TEST(Queue, RunsTasksInOrderAndReleasesEachBeforeTheNext) {
       sigset_t blocked;
       pthread_sigmask(SIG_BLOCK, nullptr, &blocked);
       EXPECT_EQ(sigismember(&blocked, SIGTERM), 1);
+      pthread_getname_np(pthread_self(), label, sizeof label);
     });
   }  // tasks given before the last reference goes still run
   group.wait();
+  EXPECT_TRUE(std::string_view(label).starts_with("a label")) << label;
   ASSERT_EQ(order.size(), 1000U);
   EXPECT_TRUE(std::ranges::is_sorted(order));
 }

@@ -83,27 +83,27 @@ TEST(StandardStreams, GoOnAfterAFailureWriteEachLineAtOnceAndDropNoByte) {
 
 TEST(StandardStreams, WaitThroughSignals) {
   constexpr std::size_t kSize = 1 << 20;  // more than a socket holds
-  static int peer = -1;
-  static std::size_t received = 0;
-  static int idle = 0;
+  static struct {
+    int socket;
+    std::size_t received;
+    int idle;
+  } peer;
   struct sigaction tick = {};
   tick.sa_handler = [](int) {  // in the middle of what the streams wait for
     char piece[65536];
     const int before = errno;
-    const auto size = recv(peer, piece, sizeof piece, MSG_DONTWAIT);
-    if (size > 0) received += static_cast<std::size_t>(size);
-    if (received == kSize && ++idle == 20) send(peer, "answer\n", 7, 0);
+    const auto size = recv(peer.socket, piece, sizeof piece, MSG_DONTWAIT);
+    if (size > 0) peer.received += static_cast<std::size_t>(size);
+    if (size <= 0 && ++peer.idle == 20) send(peer.socket, "answer\n", 7, 0);
     errno = before;
   };
   sigaction(SIGALRM, &tick, nullptr);
   platform::openStandardStreams();
   for (const int flags : {0, O_NONBLOCK}) {
-    received = 0;
-    idle = 0;
     int ends[2];
     ASSERT_EQ(socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends), 0);
     fcntl(ends[0], F_SETFL, flags);
-    peer = ends[1];
+    peer = {ends[1], 0, 0};
     const int before = dup(STDOUT_FILENO);
     for (const int stream : {STDIN_FILENO, STDOUT_FILENO}) dup2(ends[0], stream);
     itimerval timer = {{0, 1000}, {0, 1000}};
@@ -113,7 +113,7 @@ TEST(StandardStreams, WaitThroughSignals) {
     std::getline(std::cin, answer);
     setitimer(ITIMER_REAL, &(timer = {}), nullptr);
     dup2(before, STDOUT_FILENO);
-    EXPECT_EQ(received, kSize);
+    EXPECT_EQ(peer.received, kSize);
     EXPECT_EQ(answer, "answer");
   }
 }
