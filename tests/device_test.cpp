@@ -132,8 +132,11 @@ TEST(Server, IsAskedAndTakesHandlersWhileItsStateChanges) {
   host::device().dumpDelay = 40ms;
   const auto use = [] {  // shares nothing with another thread's
     const auto manager = zub::client::CreateManager("test", dispatch::queue("test"));
+    zub::client::EventsOff(manager);
     for (int i = 0; i < 100; ++i) {
-      zub::client::RegisterEventHandler(manager, "event", [](const auto&, const auto&) {});
+      zub::client::RegisterEventHandler(
+          manager, zub::kEventServerStateChange,
+          [](const auto&, const auto&) { ADD_FAILURE() << "events are off"; });
     }
     lumo::object reply;
     EXPECT_EQ(zub::client::PerformCommand(manager, zub::kCommandTraceDumpState, {}, &reply).code,
