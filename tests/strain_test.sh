@@ -13,7 +13,7 @@ fail() { echo "strain_test: $*" >&2; exit 1; }
 expect_status() {  # STATUS WHAT COMMAND ...: what it prints is of no interest
   local expected=$1 what=$2 status=0
   shift 2
-  timeout 100 "$@" >/dev/null 2>err || status=$?
+  timeout 100 env --default-signal "$@" >/dev/null 2>err || status=$?
   [ "$status" = "$expected" ] || fail "$what: status $status, not $expected: $(head -c 500 err)"
 }
 

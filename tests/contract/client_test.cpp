@@ -1,10 +1,12 @@
-// The client library of the server. Nothing here makes the device collect or reset anything.
+// The client library of the server, and what requests and replies are made of. Nothing here makes
+// the device collect or reset anything.
 
 #include <gtest/gtest.h>
 
 #include <optional>
 #include <thread>
 
+#include "platform/lumo.h"
 #include "platform/zub_client.h"
 
 using namespace std::chrono_literals;
@@ -78,6 +80,24 @@ TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
   EXPECT_FALSE(reported.wait(0ns)) << "events are off";
   zub::client::EventsOn(manager);
   EXPECT_TRUE(reported.wait(60s));
+}
+
+TEST(Dictionary, KeepsTheOrderOfItsKeysAndReadsWhatIsMissingAsTheNullObject) {
+  lumo::dict inner;
+  inner.set("text", "t");
+  lumo::dict outer;
+  outer.set("inner", "old");
+  outer.set("a", true);
+  outer.set("inner", inner);
+  ASSERT_EQ(outer.entries().size(), 2);
+  EXPECT_EQ(outer.entries()[0].key, "inner");
+  const lumo::object object(outer);
+  EXPECT_EQ(lumo::dyn_cast_or_default(object.get("inner").get("text"), "other"), "t");
+  for (const auto* const none : {&object.get("no"), &object.get("inner").get("text").get("no")}) {
+    EXPECT_FALSE(none->isDict() || none->as<std::string>() || none->as<bool>() ||
+                 none->as<std::int64_t>());
+    EXPECT_EQ(lumo::dyn_cast_or_default(*none, "other"), "other");
+  }
 }
 
 }  // namespace
