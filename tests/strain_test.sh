@@ -47,8 +47,8 @@ for profile in 'none:0: No such file or directory' '.:0: Is a directory' 'larger
   grep -qx "$profile" err || fail "not so: $profile"
 done
 expect_status 0 "standard output without a reader" \
-  bash -c 'set -o pipefail; "$0" logdump tel | true' "$program"
-expect_status 0 "a limit to a file's size" sh -c 'ulimit -f 0; "$0" logdump tel >full' "$program"
+  bash -c 'set -o pipefail; "$0" help | true' "$program"
+expect_status 0 "a limit to a file's size" sh -c 'ulimit -f 0; "$0" help >full' "$program"
 expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$program"
 expect_status 1 "too many words" \
   sh -c 'ulimit -v 600000; (yes x | head -n 20000000 | tr "\n" " "; echo; echo quit) | "$0"' "$program"
