@@ -13,7 +13,7 @@
 #include <thread>
 
 #include "platform/host/device/Device.h"
-#include "platform/host/device/RequestLog.h"
+#include "platform/host/device/Requests.h"
 #include "platform/telephony.h"
 #include "platform/zub_client.h"
 #include "tests/CapturedOutput.h"

@@ -7,8 +7,8 @@
 
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
-#include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
+#include "platform/host/device/Requests.h"
 #include "tests/CapturedOutput.h"
 #include "tests/Table.h"
 #include "tool/ZUBCommand.h"

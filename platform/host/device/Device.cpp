@@ -16,7 +16,7 @@ constexpr int kBadProfile = 255;
 constexpr std::size_t kLargestProfile = 1 << 20;
 
 [[noreturn]] void refuse(const std::string& why) {
-  static_cast<void>(posix::writeAll(STDERR_FILENO, why + "\n"));
+  complain(why);
   std::exit(kBadProfile);
 }
 
@@ -42,6 +42,10 @@ Profile* loadProfile() {
 }
 
 }  // namespace
+
+void complain(std::string_view message) {
+  static_cast<void>(posix::writeAll(STDERR_FILENO, std::string(message).append("\n")));
+}
 
 Profile& device() {
   static auto* const profile = loadProfile();  // never destroyed: other threads outlive exit

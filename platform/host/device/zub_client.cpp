@@ -7,9 +7,8 @@
 #include <utility>
 #include <vector>
 
-#include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/device/RequestLog.h"
+#include "platform/host/device/Requests.h"
 #include "platform/posix/SignalsBlocked.h"
 
 namespace zub {

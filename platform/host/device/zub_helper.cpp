@@ -1,8 +1,7 @@
 #include "platform/zub_helper.h"
 
-#include "platform/host/device/Answers.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/device/RequestLog.h"
+#include "platform/host/device/Requests.h"
 
 namespace zub {
 namespace helper {
