@@ -115,15 +115,17 @@ TEST(Processes, RunUntilTheyEndAndNotUntilTheyAreReaped) {
 
 TEST(RequestLog, SaysWhyItCannotBeWritten) {
   const ScratchFolder folder;
-  const auto unreadPipe = folder.path("pipe");
+  const auto unreadPipe = folder.path("e\u0301 \x1b]0;\xC2\x9B\x7F");
+  const auto shownPipe = folder.path("e\u0301 \\x1b]0;\\x9b\\x7f");
   ASSERT_EQ(mkfifo(unreadPipe.c_str(), 0600), 0);
-  for (const auto& [path, why] : {std::pair(unreadPipe, "No such device or address"),
-                                  {std::string("/dev/full"), "No space left on device"}}) {
+  for (const auto& [path, shown, why] :
+       {std::tuple(unreadPipe, shownPipe, "No such device or address"),
+        {"/dev/full", "/dev/full", "No space left on device"}}) {
     host::device().requestLog = path;
     testing::internal::CaptureStderr();
     host::recordRequest("request");
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
-              path + ": cannot write the request log: " + why + "\n");
+              shown + ": cannot write the request log: " + why + "\n");
   }
 }
 

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <fstream>
 
+#include "platform/posix/Utf8.h"
 #include "platform/posix/transfer.h"
 
 namespace host {
@@ -44,7 +45,17 @@ Profile* loadProfile() {
 }  // namespace
 
 void complain(std::string_view message) {
-  static_cast<void>(posix::writeAll(STDERR_FILENO, std::string(message).append("\n")));
+  std::string shown;
+  while (!message.empty()) {
+    const char32_t code = posix::takeCodePoint(message);
+    if (code < 0x20 || (code >= 0x7F && code < 0xA0)) {
+      constexpr auto kDigits = "0123456789abcdef";
+      shown.append("\\x") += {kDigits[code / 16], kDigits[code % 16]};
+    } else {
+      posix::appendUtf8(shown, code);
+    }
+  }
+  static_cast<void>(posix::writeAll(STDERR_FILENO, shown + '\n'));
 }
 
 Profile& device() {

@@ -12,8 +12,8 @@ namespace host {
 /// process with status 255. Threads: any. A test may change the profile while nothing else runs.
 Profile& device();
 
-/// Writes `message` and a line end to standard error. For what is wrong with the
-/// profile or with a file that it names.
+/// Writes `message` and a line end to standard error, with control characters as "\x1b". For what
+/// is wrong with the profile or with a file that it names.
 void complain(std::string_view message);
 
 }  // namespace host
