@@ -2,7 +2,6 @@
 #include <unistd.h>
 
 #include <csignal>
-#include <cstring>
 #include <iostream>
 #include <streambuf>
 
@@ -29,8 +28,8 @@ class InputBuffer final : public std::streambuf {
   char buffer[kBufferSize];
 };
 
-/// Writes to a descriptor what it is given until a flush, in one call where that fits. What cannot
-/// be written is dropped, and counts as written: the stream goes on.
+/// Writes to a descriptor what it is given until a flush, in one call where the buffer holds it.
+/// What cannot be written is dropped, and counts as written: the stream goes on.
 class OutputBuffer final : public std::streambuf {
  public:
   explicit OutputBuffer(int target) : descriptor(target) { setp(buffer, buffer + sizeof buffer); }
@@ -42,17 +41,6 @@ class OutputBuffer final : public std::streambuf {
       sputc(traits_type::to_char_type(byte));
     }
     return traits_type::not_eof(byte);
-  }
-
-  std::streamsize xsputn(const char* text, std::streamsize size) override {
-    if (size > epptr() - pptr()) sync();
-    if (size > epptr() - pptr()) {
-      write({text, static_cast<std::size_t>(size)});
-    } else {
-      std::memcpy(pptr(), text, static_cast<std::size_t>(size));
-      pbump(static_cast<int>(size));
-    }
-    return size;
   }
 
   int sync() override {
