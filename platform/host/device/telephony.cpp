@@ -1,8 +1,12 @@
 #include "platform/telephony.h"
 
+#include <dirent.h>
+#include <unistd.h>
+
 #include <algorithm>
-#include <filesystem>
+#include <climits>
 #include <fstream>
+#include <memory>
 #include <optional>
 
 #include "platform/host/ProcessName.h"
@@ -18,29 +22,27 @@ bool TelephonyUtilIsCarrierBuild() { return host::device().build == host::Build:
 namespace tlu {
 namespace {
 
-namespace fs = std::filesystem;
-
-/// What proc(5) says of the process with that folder: "PID (NAME) STATE ...", where the name may
-/// hold anything. Its name, or nothing when it has ended and only waits to be reaped.
-std::optional<std::string> nameOfRunning(const fs::path& process) {
+/// What proc(5) says of the process with the folder `process`: "PID (NAME) STATE ...", where the
+/// name may hold anything. Its name, or nothing when it has ended and only waits to be reaped.
+std::optional<std::string> nameOfRunning(const std::string& process) {
   std::string stat;
-  std::getline(std::ifstream(process / "stat"), stat, '\0');
+  std::getline(std::ifstream(process + "/stat"), stat, '\0');
   const auto start = stat.find('(') + 1;
   const auto end = stat.rfind(") ");
   if (start == 0 || end == std::string::npos) return std::nullopt;
   constexpr std::string_view kEnded = "ZXx";
   if (kEnded.find(stat[end + 2]) != std::string_view::npos) return std::nullopt;
-  std::error_code hidden;  // the program file of another user's process
-  const auto program = fs::read_symlink(process / "exe", hidden).string();
+  char program[PATH_MAX] = {};  // stays empty for another user's process
+  static_cast<void>(!readlink((process + "/exe").c_str(), program, sizeof program - 1));
   return std::string(host::processName(std::string_view(stat).substr(start, end - start), program));
 }
 
 /// Whether a process of this machine has that name.
 bool runsOnThisMachine(const std::string& name) {
-  std::error_code failed;
-  for (fs::directory_iterator entry("/proc", failed), end; !failed && entry != end;
-       entry.increment(failed)) {
-    if (nameOfRunning(entry->path()) == name) return true;
+  const std::unique_ptr<DIR, int (*)(DIR*)> folder(opendir("/proc"), closedir);
+  if (!folder) return false;
+  while (const dirent* const entry = readdir(folder.get())) {
+    if (nameOfRunning(std::string("/proc/") + entry->d_name) == name) return true;
   }
   return false;
 }
