@@ -1,25 +1,28 @@
 #include "platform/host/device/Profile.h"
 
 #include <algorithm>
+#include <array>
 #include <charconv>
 #include <limits>
-#include <map>
+#include <utility>
 
 #include "platform/posix/Utf8.h"
 
 namespace host {
 namespace {
 
-constexpr std::string_view kBlanks = " \t\r";
+using Text = std::string_view;
 
-std::string_view trimmed(std::string_view text) {
+constexpr Text kBlanks = " \t\r";
+
+Text trimmed(Text text) {
   const auto first = text.find_first_not_of(kBlanks);
-  if (first == std::string_view::npos) return {};
+  if (first == Text::npos) return {};
   return text.substr(first, text.find_last_not_of(kBlanks) - first + 1);
 }
 
 /// Cuts the next piece up to `separator` off the front of `text`.
-std::string_view takePiece(std::string_view& text, char separator) {
+Text takePiece(Text& text, char separator) {
   const auto end = std::min(text.find(separator), text.size());
   const auto piece = text.substr(0, end);
   text.remove_prefix(std::min(end + 1, text.size()));
@@ -28,7 +31,7 @@ std::string_view takePiece(std::string_view& text, char separator) {
 
 /// Reads all of `text` as a whole number, decimal or with 0x in front.
 template <class Number>
-bool readNumber(std::string_view text, Number& number) {
+bool readNumber(Text text, Number& number) {
   int base = 10;
   if (text.starts_with("0x")) {
     text.remove_prefix(2);
@@ -44,92 +47,108 @@ bool readNumber(std::string_view text, Number& number) {
 }
 
 template <class Value>
-bool readChoice(std::string_view text, Value& value,
-                const std::map<std::string_view, Value>& choices) {
-  const auto found = choices.find(text);
+bool readChoice(Text text, Value& value, std::initializer_list<std::pair<Text, Value>> choices) {
+  const auto* const found = std::ranges::find(choices, text, &std::pair<Text, Value>::first);
   if (found == choices.end()) return false;
   value = found->second;
   return true;
 }
 
-bool readYesNo(std::string_view text, bool& flag) {
-  return readChoice(text, flag, {{"yes", true}, {"no", false}});
+// How a value is read into the part of a profile that it sets.
+
+bool read(Text text, int& number) { return readNumber(text, number); }
+
+bool read(Text text, bool& flag) { return readChoice(text, flag, {{"yes", true}, {"no", false}}); }
+
+bool read(Text text, std::string& value) {
+  value = text;
+  return true;
 }
 
-bool readMilliseconds(std::string_view text, std::chrono::milliseconds& duration) {
+bool read(Text text, std::chrono::milliseconds& duration) {
   std::uint32_t count = 0;
   if (!readNumber(text, count)) return false;
   duration = std::chrono::milliseconds(count);
   return true;
 }
 
-/// A fault is "!null", "!empty" or "!" and a code, as a signed number or its 32 bits in
+bool read(Text text, Build& build) {
+  return readChoice(
+      text, build,
+      {{"internal", Build::internal}, {"carrier", Build::carrier}, {"customer", Build::customer}});
+}
+
+/// A text or a fault: "!null", "!empty", or "!" and a code, as a signed number or its 32 bits in
 /// hexadecimal.
-bool readFault(std::string_view text, Answer& answer) {
-  if (!text.starts_with('!')) return false;
-  text.remove_prefix(1);
-  if (text == "null") {
-    answer = {.kind = Answer::Kind::nullReply};
-    return true;
-  }
-  if (text == "empty") {
-    answer = {.kind = Answer::Kind::emptyReply};
+bool read(Text text, Answer& answer) {
+  using Kind = Answer::Kind;
+  answer = {.text = std::string(text)};
+  if (!text.starts_with('!')) return true;
+  if (readChoice(text, answer.kind, {{"!null", Kind::nullReply}, {"!empty", Kind::emptyReply}})) {
     return true;
   }
   std::int64_t code = 0;
-  if (!readNumber(text, code) || code == 0 || code < std::numeric_limits<std::int32_t>::min() ||
-      code > std::numeric_limits<std::uint32_t>::max()) {
-    return false;
-  }
-  answer = {.kind = Answer::Kind::error, .code = static_cast<std::int32_t>(code)};
-  return true;
+  answer.kind = Kind::error;
+  const bool isNumber = readNumber(text.substr(1), code);
+  answer.code = static_cast<std::int32_t>(code);
+  return isNumber && code != 0 && code >= std::numeric_limits<std::int32_t>::min() &&
+         code <= std::numeric_limits<std::uint32_t>::max();
 }
 
-bool readOkOrFault(std::string_view text, Answer& answer) {
-  if (text != "ok") return readFault(text, answer);
-  answer = {};
-  return true;
+bool readOkOrFault(Text text, Answer& answer) {
+  return (text == "ok" || text.starts_with('!')) && read(text, answer);
 }
 
-bool readTextOrFault(std::string_view text, Answer& answer) {
-  if (text.starts_with('!')) return readFault(text, answer);
-  answer = {.text = std::string(text)};
-  return true;
-}
-
-bool readTimestamp(std::string_view text, std::optional<std::string>& timestamp) {
+/// A timestamp.
+bool read(Text text, std::optional<std::string>& timestamp) {
   timestamp = text == "now" ? std::nullopt : std::optional<std::string>(text);
   return true;
 }
 
-bool readProduct(std::string_view text, int& product) {
-  using enum TelephonyProduct;
-  TelephonyProduct named{};
-  const bool isName = readChoice(text, named,
-                                 {{"Unknown", Unknown},
-                                  {"Phone", Phone},
-                                  {"PhoneLarge", PhoneLarge},
-                                  {"Tablet", Tablet},
-                                  {"TabletLarge", TabletLarge},
-                                  {"Watch1Small", Watch1Small},
-                                  {"Watch1Large", Watch1Large},
-                                  {"Watch2Small", Watch2Small},
-                                  {"Watch2Large", Watch2Large},
-                                  {"Watch3Small", Watch3Small},
-                                  {"Watch3Large", Watch3Large},
-                                  {"Watch4Small", Watch4Small},
-                                  {"Watch4Large", Watch4Large},
-                                  {"Watch5Small", Watch5Small},
-                                  {"Watch5Large", Watch5Large},
-                                  {"Watch6Small", Watch6Small},
-                                  {"Watch6Large", Watch6Large},
-                                  {"Watch7Small", Watch7Small},
-                                  {"Watch7Large", Watch7Large}});
-  if (isName) product = static_cast<int>(named);
-  return isName || readNumber(text, product);
+/// The reason of a stream's end.
+bool read(Text text, std::optional<unsigned long>& reason) {
+  reason.reset();
+  return text == "never" || readNumber(text, reason.emplace());
 }
 
-bool readProcesses(std::string_view text, Profile& profile) {
+bool read(Text text, std::vector<ServerStep>& steps) {
+  steps.clear();
+  if (text == "none") return true;
+  if (text.ends_with(',')) return false;
+  do {
+    auto state = trimmed(takePiece(text, ','));
+    ServerStep step;
+    const auto blank = std::min(state.find_first_of(kBlanks), state.size());
+    if (!read(state.substr(0, blank), step.at)) return false;
+    state.remove_prefix(blank);
+    step.state = trimmed(state);
+    if (step.state.empty() || (!steps.empty() && step.at < steps.back().at)) return false;
+    steps.push_back(std::move(step));
+  } while (!text.empty());
+  return true;
+}
+
+bool readProduct(Text text, Profile& profile) {
+  using enum TelephonyProduct;
+  static constexpr std::pair<Text, TelephonyProduct> kNames[] = {
+      {"Unknown", Unknown},         {"Phone", Phone},
+      {"PhoneLarge", PhoneLarge},   {"Tablet", Tablet},
+      {"TabletLarge", TabletLarge}, {"Watch1Small", Watch1Small},
+      {"Watch1Large", Watch1Large}, {"Watch2Small", Watch2Small},
+      {"Watch2Large", Watch2Large}, {"Watch3Small", Watch3Small},
+      {"Watch3Large", Watch3Large}, {"Watch4Small", Watch4Small},
+      {"Watch4Large", Watch4Large}, {"Watch5Small", Watch5Small},
+      {"Watch5Large", Watch5Large}, {"Watch6Small", Watch6Small},
+      {"Watch6Large", Watch6Large}, {"Watch7Small", Watch7Small},
+      {"Watch7Large", Watch7Large}};
+  const auto* const named =
+      std::ranges::find(kNames, text, &std::pair<Text, TelephonyProduct>::first);
+  if (named == std::end(kNames)) return readNumber(text, profile.product);
+  profile.product = static_cast<int>(named->second);
+  return true;
+}
+
+bool readProcesses(Text text, Profile& profile) {
   profile.processes.clear();
   profile.hostProcesses = false;
   while (!(text = trimmed(text)).empty()) {
@@ -144,107 +163,77 @@ bool readProcesses(std::string_view text, Profile& profile) {
   return true;
 }
 
-bool readServer(std::string_view text, std::vector<ServerStep>& steps) {
-  steps.clear();
-  if (text == "none") return true;
-  if (text.ends_with(',')) return false;
-  do {
-    auto state = trimmed(takePiece(text, ','));
-    ServerStep step;
-    const auto blank = std::min(state.find_first_of(kBlanks), state.size());
-    if (!readMilliseconds(state.substr(0, blank), step.at)) return false;
-    state.remove_prefix(blank);
-    step.state = trimmed(state);
-    if (step.state.empty() || (!steps.empty() && step.at < steps.back().at)) return false;
-    steps.push_back(std::move(step));
-  } while (!text.empty());
-  return true;
+bool readCompression(Text text, Profile& profile) {
+  return readChoice(text, profile.compression, {{"nocompress", 0}, {"tar.gz", 1}, {"tar", 2}});
 }
 
-bool readLogEnd(std::string_view text, std::optional<unsigned long>& reason) {
-  reason.reset();
-  return text == "never" || readNumber(text, reason.emplace());
+bool readDump(Text text, Profile& profile) { return readOkOrFault(text, profile.dump); }
+
+bool readHelper(Text text, Profile& profile) {
+  profile.helperExists = text != "none";
+  return !profile.helperExists || readOkOrFault(text, profile.helper);
 }
 
-bool readText(std::string_view text, std::string& value) {
-  value = text;
-  return true;
+bool readLogPrepare(Text text, Profile& profile) {
+  return read(text == "ok" ? Text() : text, profile.logPrepareError);
+}
+
+/// Reads the part of a profile that a value alone sets.
+template <auto Part>
+bool readPart(Text text, Profile& profile) {
+  return read(text, profile.*Part);
 }
 
 /// A path in a profile is taken from the profile's own folder.
-std::string besideProfile(std::string_view path, const std::string& file) {
+std::string besideProfile(Text path, const std::string& file) {
   const auto slash = file.rfind('/');
   if (path.starts_with('/') || slash == std::string::npos) return std::string(path);
   return file.substr(0, slash + 1).append(path);
 }
 
 struct Key {
-  std::string_view name;
-  std::string_view takes;  ///< for the message about a bad value
-  bool (*read)(std::string_view value, Profile& profile);
+  Text name;
+  Text takes;  ///< for the message about a bad value
+  bool (*read)(Text value, Profile& profile);
   bool mayBeEmpty = false;
 };
 
-constexpr std::string_view kWhole = "a whole number";
-constexpr std::string_view kYesNo = "yes or no";
-constexpr std::string_view kOkOrFault = "ok, !CODE (not 0), !null or !empty";
-constexpr std::string_view kTextOrFault = "a text, !CODE (not 0), !null or !empty";
-
-using Text = std::string_view;
+constexpr Text kWhole = "a whole number";
+constexpr Text kYesNo = "yes or no";
+constexpr Text kTextOrFault = "a text, !CODE (not 0), !null or !empty";
 
 constexpr Key kKeys[] = {
-    {"radio", kWhole, [](Text t, Profile& p) { return readNumber(t, p.radio); }},
-    {"product", "a whole number or a product's name",
-     [](Text t, Profile& p) { return readProduct(t, p.product); }},
-    {"radio-vendor", kWhole, [](Text t, Profile& p) { return readNumber(t, p.radioVendor); }},
-    {"qdss", kYesNo, [](Text t, Profile& p) { return readYesNo(t, p.qdss); }},
-    {"build", "internal, carrier or customer",
-     [](Text t, Profile& p) {
-       return readChoice(t, p.build,
-                         {{"internal", Build::internal},
-                          {"carrier", Build::carrier},
-                          {"customer", Build::customer}});
-     }},
-    {"compression", "nocompress, tar.gz or tar",
-     [](Text t, Profile& p) {
-       return readChoice(t, p.compression, {{"nocompress", 0}, {"tar.gz", 1}, {"tar", 2}});
-     }},
-    {"compression-supported", kYesNo,
-     [](Text t, Profile& p) { return readYesNo(t, p.compressionSupported); }},
+    {"radio", kWhole, readPart<&Profile::radio>},
+    {"product", "a whole number or a product's name", readProduct},
+    {"radio-vendor", kWhole, readPart<&Profile::radioVendor>},
+    {"qdss", kYesNo, readPart<&Profile::qdss>},
+    {"build", "internal, carrier or customer", readPart<&Profile::build>},
+    {"compression", "nocompress, tar.gz or tar", readCompression},
+    {"compression-supported", kYesNo, readPart<&Profile::compressionSupported>},
     {"processes", "names of processes", readProcesses, true},
     {"server", "none, or steps 'MS STATE' in order of time, separated by commas",
-     [](Text t, Profile& p) { return readServer(t, p.server); }},
-    {"system-logs-mode", kTextOrFault,
-     [](Text t, Profile& p) { return readTextOrFault(t, p.systemLogsMode); }, true},
-    {"baseband-enabled", kTextOrFault,
-     [](Text t, Profile& p) { return readTextOrFault(t, p.basebandEnabled); }, true},
-    {"baseband-high-throughput", kTextOrFault,
-     [](Text t, Profile& p) { return readTextOrFault(t, p.basebandHighThroughput); }, true},
-    {"dump", kOkOrFault, [](Text t, Profile& p) { return readOkOrFault(t, p.dump); }},
-    {"dump-timestamp", "a text",
-     [](Text t, Profile& p) { return readTimestamp(t, p.dumpTimestamp); }, true},
-    {"dump-delay", "milliseconds",
-     [](Text t, Profile& p) { return readMilliseconds(t, p.dumpDelay); }},
-    {"helper", "ok, none, !CODE (not 0), !null or !empty",
-     [](Text t, Profile& p) {
-       p.helperExists = t != "none";
-       return !p.helperExists || readOkOrFault(t, p.helper);
-     }},
-    {"helper-timestamp", "a text",
-     [](Text t, Profile& p) { return readTimestamp(t, p.helperTimestamp); }, true},
-    {"request-log", "a path", [](Text t, Profile& p) { return readText(t, p.requestLog); }},
-    {"log", "sample, journal or a path", [](Text t, Profile& p) { return readText(t, p.log); }},
-    {"log-prepare", "ok or a text",
-     [](Text t, Profile& p) { return readText(t == "ok" ? Text() : t, p.logPrepareError); }},
-    {"log-end", "a whole number or never",
-     [](Text t, Profile& p) { return readLogEnd(t, p.logEnd); }},
+     readPart<&Profile::server>},
+    {"system-logs-mode", kTextOrFault, readPart<&Profile::systemLogsMode>, true},
+    {"baseband-enabled", kTextOrFault, readPart<&Profile::basebandEnabled>, true},
+    {"baseband-high-throughput", kTextOrFault, readPart<&Profile::basebandHighThroughput>, true},
+    {"dump", "ok, !CODE (not 0), !null or !empty", readDump},
+    {"dump-timestamp", "a text", readPart<&Profile::dumpTimestamp>, true},
+    {"dump-delay", "milliseconds", readPart<&Profile::dumpDelay>},
+    {"helper", "ok, none, !CODE (not 0), !null or !empty", readHelper},
+    {"helper-timestamp", "a text", readPart<&Profile::helperTimestamp>, true},
+    {"request-log", "a path", readPart<&Profile::requestLog>},
+    {"log", "sample, journal or a path", readPart<&Profile::log>},
+    {"log-prepare", "ok or a text", readLogPrepare},
+    {"log-end", "a whole number or never", readPart<&Profile::logEnd>},
 };
 
-std::string quoted(std::string_view text) { return std::string("'").append(text).append("'"); }
+std::string quoted(Text text) { return std::string("'").append(text).append("'"); }
+
+/// The line on which each key is set, or 0.
+using FirstLines = std::array<int, std::size(kKeys)>;
 
 /// Reads one line into `profile`. Returns what is wrong, or an empty text.
-std::string readLine(std::string_view line, Profile& profile,
-                     std::map<std::string_view, int>& firstLines, int number) {
+std::string readLine(Text line, Profile& profile, FirstLines& firstLines, int number) {
   if (!posix::isUtf8(line)) return "not UTF-8 text";
   if (line.find('\0') != Text::npos) return "a NUL byte, which no text holds";
   line = trimmed(line.substr(0, line.find('#')));
@@ -255,8 +244,11 @@ std::string readLine(std::string_view line, Profile& profile,
   const auto value = trimmed(line.substr(equals + 1));
   const auto* const key = std::ranges::find(kKeys, name, &Key::name);
   if (key == std::end(kKeys)) return "unknown key " + quoted(name);
-  const auto [first, isNew] = firstLines.emplace(key->name, number);
-  if (!isNew) return quoted(name) + " is set on line " + std::to_string(first->second) + " already";
+  int& firstLine = firstLines[static_cast<std::size_t>(key - kKeys)];
+  if (firstLine > 0) {
+    return quoted(name) + " is set on line " + std::to_string(firstLine) + " already";
+  }
+  firstLine = number;
   if ((value.empty() && !key->mayBeEmpty) || !key->read(value, profile)) {
     return quoted(name) + " takes " + std::string(key->takes) + ", not " + quoted(value);
   }
@@ -273,9 +265,9 @@ std::vector<std::string_view> profileKeys() {
 
 std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
                                         Profile& profile) {
-  constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
+  constexpr Text kByteOrderMark = "\xEF\xBB\xBF";
   if (text.starts_with(kByteOrderMark)) text.remove_prefix(kByteOrderMark.size());
-  std::map<std::string_view, int> firstLines;
+  FirstLines firstLines{};
   for (int number = 1; !text.empty(); ++number) {
     const auto wrong = readLine(takePiece(text, '\n'), profile, firstLines, number);
     if (!wrong.empty())

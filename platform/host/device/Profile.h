@@ -15,7 +15,7 @@ namespace host {
 struct Answer {
   enum class Kind { value, error, nullReply, emptyReply };
   Kind kind = Kind::value;
-  std::string text = {};  ///< of a value, where the request has one
+  std::string text = {};  ///< as the profile has it
   std::int32_t code = 0;  ///< of an error
 
   friend bool operator==(const Answer&, const Answer&) = default;
@@ -49,12 +49,12 @@ struct Profile {
   Answer systemLogsMode = {.text = "full"};
   Answer basebandEnabled = {.text = "true"};
   Answer basebandHighThroughput = {.text = "false"};
-  Answer dump;
+  Answer dump = {.text = "ok"};
   std::optional<std::string> dumpTimestamp;  ///< none: the time of the answer
   std::chrono::milliseconds dumpDelay{0};
 
   bool helperExists = true;
-  Answer helper;
+  Answer helper = {.text = "ok"};
   std::optional<std::string> helperTimestamp;
 
   std::string requestLog;  ///< path; empty for none
