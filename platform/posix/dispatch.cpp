@@ -58,60 +58,52 @@ bool group::wait(std::chrono::nanoseconds timeout) const {
                               [this] { return state->entered == 0; });
 }
 
-namespace {
-
-/// The tasks of one queue; shared by its references and its thread.
-struct Tasks {
+/// The tasks of one queue, shared by its references and its thread.
+struct queue::Worker {
   std::mutex mutex;
   std::condition_variable changed;
   std::deque<block<void()>> waiting;
   bool abandoned = false;  ///< the last reference has gone
+
+  /// Runs tasks until the queue is abandoned and empty. Each task is released before the next wait.
+  void run() {
+    std::unique_lock lock(mutex);
+    for (;;) {
+      changed.wait(lock, [this] { return abandoned || !waiting.empty(); });
+      if (waiting.empty()) return;
+      block<void()> task = std::move(waiting.front());
+      waiting.pop_front();
+      lock.unlock();
+      task();
+      task = nullptr;
+      lock.lock();
+    }
+  }
+
+  void abandon() {
+    const std::lock_guard lock(mutex);
+    abandoned = true;
+    changed.notify_one();
+  }
 };
 
-/// Runs tasks until the queue is abandoned and empty. Each task is released before the next wait.
-void runTasks(Tasks& tasks) {
-  std::unique_lock lock(tasks.mutex);
-  for (;;) {
-    tasks.changed.wait(lock, [&] { return tasks.abandoned || !tasks.waiting.empty(); });
-    if (tasks.waiting.empty()) return;
-    block<void()> task = std::move(tasks.waiting.front());
-    tasks.waiting.pop_front();
-    lock.unlock();
-    task();
-    task = nullptr;
-    lock.lock();
-  }
+queue::queue(std::string label) {
+  const auto shared = std::make_shared<Worker>();
+  const posix::SignalsBlocked onTheThread;
+  std::thread thread([shared] { shared->run(); });
+  constexpr std::size_t kLongestThreadName = 15;  // pthread_setname_np(3)
+  label.resize(std::min(label.size(), kLongestThreadName));
+  pthread_setname_np(thread.native_handle(), label.c_str());
+  thread.detach();
+  // Counts the references to the queue alone; the thread has its own.
+  worker = std::shared_ptr<Worker>(shared.get(), [shared](Worker* left) { left->abandon(); });
 }
-
-}  // namespace
-
-/// Shared by the references alone: when it goes, the thread knows that no further task can come.
-struct queue::Worker {
-  std::shared_ptr<Tasks> tasks = std::make_shared<Tasks>();
-
-  explicit Worker(const std::string& label) {
-    const posix::SignalsBlocked onTheThread;
-    std::thread thread([owned = tasks] { runTasks(*owned); });
-    constexpr std::size_t kLongestThreadName = 15;  // pthread_setname_np(3)
-    pthread_setname_np(thread.native_handle(), label.substr(0, kLongestThreadName).c_str());
-    thread.detach();
-  }
-  Worker(const Worker&) = delete;
-  Worker& operator=(const Worker&) = delete;
-  ~Worker() {
-    const std::lock_guard lock(tasks->mutex);
-    tasks->abandoned = true;
-    tasks->changed.notify_one();
-  }
-};
-
-queue::queue(std::string label) : worker(std::make_shared<Worker>(label)) {}
 
 void queue::async(block<void()> task) const {
   if (!worker) return;
-  const std::lock_guard lock(worker->tasks->mutex);
-  worker->tasks->waiting.push_back(std::move(task));
-  worker->tasks->changed.notify_one();
+  const std::lock_guard lock(worker->mutex);
+  worker->waiting.push_back(std::move(task));
+  worker->changed.notify_one();
 }
 
 }  // namespace dispatch
