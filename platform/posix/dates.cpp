@@ -1,4 +1,3 @@
-#include <array>
 #include <chrono>
 #include <cmath>
 #include <ctime>
@@ -10,34 +9,12 @@ namespace {
 
 constexpr std::int64_t kMicrosecondsASecond = 1'000'000;
 
-std::int64_t wholeSeconds(OSLogDate date) {
+/// The seconds of no date.
+constexpr std::time_t kNever = std::numeric_limits<std::time_t>::max();
+
+std::time_t wholeSeconds(OSLogDate date) {
   const std::chrono::microseconds since(date.microsecondsSince1970());
-  return std::chrono::floor<std::chrono::seconds>(since).count();
-}
-
-/// The text of a date to the second, with room for the longest year that a date can have.
-struct DateText {
-  std::array<char, sizeof "-290308-MM-DD HH:MM:SS +0000"> text{};
-  std::size_t length = 0;
-};
-
-DateText describe(std::int64_t seconds) {
-  const auto moment = static_cast<std::time_t>(seconds);
-  std::tm utc{};
-  DateText date;
-  if (::gmtime_r(&moment, &utc) != nullptr) {
-    date.length =
-        std::strftime(date.text.data(), date.text.size(), "%Y-%m-%d %H:%M:%S +0000", &utc);
-  }
-  return date;
-}
-
-/// The local zone's offset at a moment; 0 for moments that the C library cannot convert.
-std::int32_t localOffset(std::int64_t seconds) {
-  const auto moment = static_cast<std::time_t>(seconds);
-  std::tm local{};
-  if (::localtime_r(&moment, &local) == nullptr) return 0;
-  return static_cast<std::int32_t>(local.tm_gmtoff);
+  return static_cast<std::time_t>(std::chrono::floor<std::chrono::seconds>(since).count());
 }
 
 }  // namespace
@@ -63,25 +40,29 @@ OSLogDate OSLogDate::addingSeconds(double seconds) const {
 
 void OSLogDate::appendDescription(std::string& text) const {
   // Of the events of a log, most come in the same second as the one before.
-  static thread_local std::int64_t knownSeconds = std::numeric_limits<std::int64_t>::max();
-  static thread_local DateText known;
-  const std::int64_t seconds = wholeSeconds(*this);
+  static thread_local std::time_t knownSeconds = kNever;
+  static thread_local char known[sizeof "-290308-MM-DD HH:MM:SS +0000"];
+  const std::time_t seconds = wholeSeconds(*this);
   if (seconds != knownSeconds) {
-    known = describe(seconds);
+    std::tm utc{};
+    ::gmtime_r(&seconds, &utc);
+    std::strftime(known, sizeof known, "%Y-%m-%d %H:%M:%S +0000", &utc);
     knownSeconds = seconds;
   }
-  text.append(known.text.data(), known.length);
+  text.append(known);
 }
 
 std::int32_t OSLogTimeZone::secondsFromGMT(OSLogDate date) const {
   if (fixed) return *fixed;
   // Asking the C library takes its lock, and longer than all the rest of an event.
-  struct Known {
-    std::int64_t seconds;
-    std::int32_t offset;
-  };
-  static thread_local Known known{std::numeric_limits<std::int64_t>::max(), 0};
-  const std::int64_t seconds = wholeSeconds(date);
-  if (seconds != known.seconds) known = {seconds, localOffset(seconds)};
-  return known.offset;
+  static thread_local std::time_t knownSeconds = kNever;
+  static thread_local std::int32_t known;
+  const std::time_t seconds = wholeSeconds(date);
+  if (seconds != knownSeconds) {
+    std::tm local{};
+    ::localtime_r(&seconds, &local);
+    known = static_cast<std::int32_t>(local.tm_gmtoff);
+    knownSeconds = seconds;
+  }
+  return known;
 }
