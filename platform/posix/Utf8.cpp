@@ -9,14 +9,18 @@ constexpr char32_t kReplacement = 0xFFFD;
 
 struct Sequence {
   std::size_t length;
+  char32_t code;
   bool wellFormed;
 };
 
-/// The well-formed sequence at the start of `text`, or the maximal subpart of an ill-formed one.
+/// The well-formed sequence at the start of `text`, or the maximal subpart of an ill-formed one,
+/// with the replacement character.
 Sequence firstSequence(std::string_view text) {
+  constexpr std::array<unsigned char, 5> kLeadBits = {0, 0x7F, 0x1F, 0x0F, 0x07};
   const auto lead = static_cast<unsigned char>(text[0]);
   const std::size_t length = utf8Length(text[0]);
-  if (length == 0) return {1, false};
+  if (length == 0) return {1, kReplacement, false};
+  char32_t code = lead & kLeadBits[length];
   // What excludes overlong forms, surrogates and the codes beyond U+10FFFF is the second byte.
   unsigned char low = 0x80;
   unsigned char high = 0xBF;
@@ -25,13 +29,14 @@ Sequence firstSequence(std::string_view text) {
   if (lead == 0xF0) low = 0x90;
   if (lead == 0xF4) high = 0x8F;
   for (std::size_t i = 1; i < length; ++i) {
-    if (i == text.size()) return {i, false};
+    if (i == text.size()) return {i, kReplacement, false};
     const auto byte = static_cast<unsigned char>(text[i]);
-    if (byte < low || byte > high) return {i, false};
+    if (byte < low || byte > high) return {i, kReplacement, false};
+    code = (code << 6) | (byte & 0x3FU);
     low = 0x80;
     high = 0xBF;
   }
-  return {length, true};
+  return {length, code, true};
 }
 
 /// Whether `text` is ASCII throughout. Without an exit from the loop, which makes it many bytes at
@@ -40,21 +45,6 @@ bool isAscii(std::string_view text) {
   unsigned char seen = 0;
   for (const char byte : text) seen |= static_cast<unsigned char>(byte);
   return seen < 0x80;
-}
-
-/// The length of the longest well-formed beginning of `text`.
-std::size_t wellFormedLength(std::string_view text) {
-  std::size_t length = 0;
-  while (length < text.size()) {
-    if (static_cast<unsigned char>(text[length]) < 0x80) {
-      ++length;
-      continue;
-    }
-    const Sequence sequence = firstSequence(text.substr(length));
-    if (!sequence.wellFormed) break;
-    length += sequence.length;
-  }
-  return length;
 }
 
 }  // namespace
@@ -69,33 +59,26 @@ std::size_t utf8Length(char lead) {
 }
 
 bool isUtf8(std::string_view text) {
-  return isAscii(text) || wellFormedLength(text) == text.size();
+  if (isAscii(text)) return true;
+  while (!text.empty()) {
+    const Sequence sequence = firstSequence(text);
+    if (!sequence.wellFormed) return false;
+    text.remove_prefix(sequence.length);
+  }
+  return true;
 }
 
 std::string_view asUtf8(std::string_view text, std::string& storage) {
   if (isUtf8(text)) return text;
   storage.clear();
-  while (!text.empty()) {
-    const std::size_t good = wellFormedLength(text);
-    storage.append(text.substr(0, good));
-    text.remove_prefix(good);
-    if (!text.empty()) appendUtf8(storage, takeCodePoint(text));
-  }
+  while (!text.empty()) appendUtf8(storage, takeCodePoint(text));
   return storage;
 }
 
 char32_t takeCodePoint(std::string_view& text) {
   const Sequence sequence = firstSequence(text);
-  char32_t code = kReplacement;
-  if (sequence.wellFormed) {
-    constexpr std::array<unsigned char, 5> kLeadBits = {0, 0x7F, 0x1F, 0x0F, 0x07};
-    code = static_cast<unsigned char>(text[0]) & kLeadBits[sequence.length];
-    for (std::size_t i = 1; i < sequence.length; ++i) {
-      code = (code << 6) | (static_cast<unsigned char>(text[i]) & 0x3FU);
-    }
-  }
   text.remove_prefix(sequence.length);
-  return code;
+  return sequence.code;
 }
 
 void appendUtf8(std::string& text, char32_t codePoint) {
