@@ -16,8 +16,8 @@
 #include "platform/host/Libedit.h"
 #include "platform/host/TerminalSession.h"
 #include "platform/host/WideText.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
-#include "platform/posix/transfer.h"
 
 namespace {
 

@@ -6,8 +6,7 @@
 #include <system_error>
 
 #include "platform/host/device/Device.h"
-#include "platform/posix/files.h"
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 namespace {
