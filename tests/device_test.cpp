@@ -21,6 +21,7 @@
 #include "tests/Program.h"
 #include "tests/Table.h"
 #include "tool/ServerState.h"
+#include "tool/StartUpChecks.h"
 #include "tool/ZUBCommand.h"
 
 using namespace std::chrono_literals;
@@ -68,7 +69,8 @@ TEST(Profile, KnowsProductsByName) {
   for (const auto& [name, code] : products) {
     Profile profile;
     EXPECT_EQ(parse("product = " + name, profile), "good");
-    EXPECT_EQ(profile.product, code) << name;
+    EXPECT_EQ(host::device().product = profile.product, code) << name;
+    EXPECT_EQ(config::hw::watch(), name.starts_with("Watch")) << name;
   }
 }
 
