@@ -1,0 +1,71 @@
+#include "platform/host/EditedLine.h"
+
+#include <algorithm>
+
+#include "platform/host/ScreenText.h"
+
+namespace host {
+namespace {
+
+/// The length in bytes of the last character of `text`, which may be empty.
+std::size_t lastLength(std::string_view text) {
+  std::size_t length = 0;
+  for (; !text.empty(); text.remove_prefix(length)) length = firstLength(text);
+  return length;
+}
+
+}  // namespace
+
+void EditedLine::set(std::string text, std::size_t position) {
+  bytes = std::move(text);
+  cursor = std::min(position, bytes.size());
+}
+
+void EditedLine::insert(std::string_view text) {
+  bytes.insert(cursor, text);
+  cursor += text.size();
+}
+
+std::string EditedLine::erase(Motion motion) {
+  const auto [first, last] = std::minmax({cursor, after(motion)});
+  auto erased = bytes.substr(first, last - first);
+  bytes.erase(first, last - first);
+  cursor = first;
+  return erased;
+}
+
+void EditedLine::transpose() {
+  if (cursor == 0) return;
+  if (cursor == bytes.size()) move(Motion::left);
+  const auto right = erase(Motion::right);
+  move(Motion::left);
+  insert(right);
+  move(Motion::right);
+}
+
+std::size_t EditedLine::after(Motion motion) const {
+  constexpr auto kWhiteSpace = " \t\n\v\f\r";
+  const auto before = std::string_view(bytes).substr(0, cursor);
+  const auto rest = std::string_view(bytes).substr(cursor);
+  switch (motion) {
+    using enum Motion;
+    case toStart:
+      return 0;
+    case toEnd:
+      return bytes.size();
+    case left:
+      return cursor - lastLength(before);
+    case right:
+      return cursor + (rest.empty() ? 0 : firstLength(rest));
+    case wordLeft:
+      return before.substr(0, before.find_last_not_of(kWhiteSpace) + 1).find_last_of(kWhiteSpace) +
+             1;
+    case wordRight:
+      return std::min(
+          bytes.find_first_of(kWhiteSpace, bytes.find_first_not_of(kWhiteSpace, cursor)),
+          bytes.size());
+  }
+  return cursor;
+}
+
+}  // namespace host
