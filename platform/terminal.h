@@ -14,18 +14,20 @@ namespace platform {
 using LineCompleter = std::function<std::map<std::string, std::string>(const std::string& typed)>;
 
 /// Shows `prompt` on the terminal and has a person edit a line there, with keys to move about, a
-/// history of the lines before, and `complete` for Tab. Leaves the line in `line`, without its line
-/// end, each byte as it was typed; a NUL is a key without use.
+/// history of the lines before, and `complete` for Tab. Leaves the line in the empty `line`, without
+/// its line end, each byte as it was typed. A paste gives a line for each key that ends one, and has
+/// a blank for all other white space.
 ///
-/// True for a line; false when the input has ended. Nothing, with nothing shown or read, when there
-/// is no terminal to edit on: standard input or standard output is none, TERM is not set, not known
-/// or "dumb", or the port has no line editing. That answer stays the same while the program runs.
+/// True for a line; an empty one when Ctrl-C has given it up. False when the input has ended.
+/// Nothing, with nothing shown or read, when there is no terminal to edit on: standard input or
+/// standard output is none, TERM is not set or "dumb", or the port has no line editing. That answer
+/// stays the same while the program runs.
 ///
 /// The terminal's settings are other than before while this waits for keys, and at no other time:
 /// they are back before it returns, and however the process ends or stops meanwhile, save by a
-/// signal that no program can handle, a fault of its own, or a timer of a profiler. Signals do what
-/// they do without it. What standard output was given before must have been flushed. Threads: one,
-/// any; `complete` runs on it.
+/// signal that no program can handle, or by a fault of its own. Signals do what they do without it.
+/// What standard output was given before must have been flushed. Throws `std::bad_alloc`. Threads:
+/// one, any, and the others block the signals that end or stop the process; `complete` runs on it.
 std::optional<bool> readEditedLine(const std::string& prompt, const LineCompleter& complete,
                                    std::string& line);
 

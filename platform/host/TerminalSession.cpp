@@ -1,173 +1,174 @@
 #include "platform/host/TerminalSession.h"
 
 #include <poll.h>
-#include <pthread.h>
+#include <sys/ioctl.h>
 #include <termios.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
-#include <atomic>
 #include <cerrno>
-#include <cstdlib>
-#include <ctime>
+#include <tuple>
+
+#include "platform/posix/transfer.h"
 
 namespace host {
 namespace {
 
-constexpr std::array kEnding = {SIGHUP,  SIGINT,  SIGQUIT, SIGTERM, SIGABRT,
-                                SIGTSTP, SIGALRM, SIGUSR1, SIGUSR2, SIGXCPU};
-constexpr std::array kWaking = {SIGCONT, SIGWINCH};
+constexpr std::string_view kMarkPastes = "\033[?2004h";
+constexpr std::string_view kMarkNoPastes = "\033[?2004l";
 
-// Signal handlers have no other way to what they need.
-termios gBefore{};                      // settings to go back to
-termios gEditing{};                     // those for editing
-std::atomic<pthread_t> gEditor = {};    // the thread that edits
-std::atomic<bool> gIsEditing = false;   // the settings may be other than before
-std::atomic<bool> gIsBusy = false;      // the editor may be about to change them
-std::atomic<bool> gIsGivenUp = false;   // nobody may change them: the process ends or stops
-std::atomic<bool> gWasResized = false;  // for the editor, at its next wait
-std::atomic<bool> gWasContinued = false;
-std::array<struct sigaction, kEnding.size()> gEndingBefore{};
-std::array<struct sigaction, kWaking.size()> gWakingBefore{};
+// A signal handler has no other way to what it needs.
+termios gBefore{};                          // settings to go back to
+volatile std::sig_atomic_t gIsEditing = 0;  // the settings are others now
+volatile std::sig_atomic_t gWasResized = 0;
+volatile std::sig_atomic_t gWasContinued = 0;
 
-void pauseFor1ms() {
-  constexpr timespec kPause = {.tv_sec = 0, .tv_nsec = 1'000'000};
-  nanosleep(&kPause, nullptr);
+/// Puts the settings back, unless another job has the terminal and settings of its own. Never
+/// waits, and is safe in a handler of signals.
+void leave() {
+  if (gIsEditing == 0) return;
+  gIsEditing = 0;
+  if (!hasTerminal()) return;
+  tcsetattr(STDIN_FILENO, TCSANOW, &gBefore);
+  pollfd output = {STDOUT_FILENO, POLLOUT, 0};
+  if (::poll(&output, 1, 0) <= 0) return;
+  std::ignore = ::write(STDOUT_FILENO, kMarkNoPastes.data(), kMarkNoPastes.size());
 }
 
-void apply(int when, const termios& settings) {
-  while (tcsetattr(STDIN_FILENO, when, &settings) != 0 && errno == EINTR) {
-  }
-}
-
-/// Puts the settings back and keeps the editor from changing them. Safe in a signal handler.
-void giveUp() {
-  gIsGivenUp = true;
-  // The editor may be stuck in an output that nobody reads; so there is an end to the patience.
-  for (int i = 0; gIsBusy && i < 200; ++i) pauseFor1ms();
-  if (gIsEditing.exchange(false)) apply(TCSANOW, gBefore);
-}
-
-void wakeEditor() {
-  if (pthread_equal(gEditor, pthread_self()) == 0) pthread_kill(gEditor, SIGWINCH);
-}
-
-void setSignals(sigset_t& set, const auto& signals) {
-  sigemptyset(&set);
-  for (const int signal : signals) sigaddset(&set, signal);
-}
-
-extern "C" void onEndingSignal(int signal) {
-  const int errorBefore = errno;
-  giveUp();
-  std::size_t index = 0;
-  while (kEnding[index] != signal) ++index;
-  struct sigaction own = {};
-  sigaction(signal, &gEndingBefore[index], &own);
-  sigset_t only;
-  sigemptyset(&only);
-  sigaddset(&only, signal);
-  raise(signal);
-  pthread_sigmask(SIG_UNBLOCK, &only, nullptr);  // here it ends, or stops and goes on
-  sigaction(signal, &own, nullptr);
-  gIsGivenUp = false;
-  wakeEditor();
-  errno = errorBefore;
-}
-
-extern "C" void onWakingSignal(int signal) {
-  const int errorBefore = errno;
-  (signal == SIGCONT ? gWasContinued : gWasResized) = true;
-  wakeEditor();
-  errno = errorBefore;
-}
-
-/// From here on the editor may change the settings, once nobody has given them up.
-void becomeBusy() {
-  gIsBusy = true;
-  while (gIsGivenUp) {
-    gIsBusy = false;
-    pauseFor1ms();
-    gIsBusy = true;
-  }
-}
-
-/// Has `signals` handled; those that are ignored stay so.
-template <std::size_t N>
-void handle(const std::array<int, N>& signals, void (*handler)(int),
-            std::array<struct sigaction, N>& before) {
+void handle(int signal, int flags, void (*handler)(int)) {
   struct sigaction action = {};
   action.sa_handler = handler;
-  action.sa_flags = SA_RESTART;
-  for (std::size_t i = 0; i < N; ++i) {
-    sigaction(signals[i], nullptr, &before[i]);
-    const bool isIgnored = before[i].sa_handler == SIG_IGN;
-    if (!isIgnored || signals[i] == SIGWINCH) sigaction(signals[i], &action, nullptr);
-  }
+  action.sa_flags = flags;
+  sigaction(signal, &action, nullptr);
 }
 
-template <std::size_t N>
-void handleAsBefore(const std::array<int, N>& signals,
-                    const std::array<struct sigaction, N>& before) {
-  for (std::size_t i = 0; i < N; ++i) sigaction(signals[i], &before[i], nullptr);
+extern "C" void onWaking(int signal) { (signal == SIGCONT ? gWasContinued : gWasResized) = 1; }
+
+/// Called once for a signal, which then does what it does by default.
+extern "C" void onEnding(int signal) {
+  const int errorBefore = errno;
+  leave();
+  raise(signal);  // here the process ends, or stops and goes on
+  handle(signal, SA_RESETHAND | SA_NODEFER, onEnding);
+  gWasContinued = 1;
+  errno = errorBefore;
 }
 
-/// Reads the settings once the process has the terminal; a change from the background stops it.
-void readSettings(termios& settings) {
-  while (tcdrain(STDIN_FILENO) != 0 && errno == EINTR) {
-  }
-  tcgetattr(STDIN_FILENO, &settings);
+/// Sets the calling thread's mask of blocked signals while this lives.
+class SignalMask {
+ public:
+  explicit SignalMask(const sigset_t& blocked) { pthread_sigmask(SIG_SETMASK, &blocked, &before); }
+  SignalMask(const SignalMask&) = delete;
+  SignalMask& operator=(const SignalMask&) = delete;
+  ~SignalMask() { pthread_sigmask(SIG_SETMASK, &before, nullptr); }
+
+ private:
+  sigset_t before{};
+};
+
+/// The settings for editing, but for what the user has chosen: keys come one at a time and as they
+/// are, and Ctrl-C is one of them. Ctrl-Z and Ctrl-\ are signals still.
+termios forEditing(termios settings) {
+  settings.c_iflag &= ~static_cast<tcflag_t>(ICRNL | INLCR | IGNCR | ISTRIP);
+  settings.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO | IEXTEN);
+  settings.c_cc[VINTR] = _POSIX_VDISABLE;
+  settings.c_cc[VMIN] = 1;
+  settings.c_cc[VTIME] = 0;
+  return settings;
 }
 
 }  // namespace
 
+std::vector<int> endingSignals() {
+  constexpr std::array kOthers = {SIGKILL, SIGSTOP, SIGSEGV, SIGBUS, SIGFPE,  SIGILL,
+                                  SIGTRAP, SIGSYS,  SIGCHLD, SIGURG, SIGCONT, SIGWINCH};
+  std::vector<int> ending;
+  for (int signal = 1; signal <= SIGRTMAX; ++signal) {
+    struct sigaction now = {};
+    const bool isOther = std::ranges::find(kOthers, signal) != kOthers.end();
+    if (isOther || sigaction(signal, nullptr, &now) != 0) continue;
+    if (now.sa_handler == SIG_DFL) ending.push_back(signal);
+  }
+  return ending;
+}
+
+bool hasTerminal() {
+  const pid_t owner = tcgetpgrp(STDIN_FILENO);
+  return owner < 0 || owner == getpgrp();
+}
+
 TerminalSession::TerminalSession() {
-  static const int registered = std::atexit(giveUp);
-  static_cast<void>(registered);
-  sigset_t handled;
-  setSignals(handled, kEnding);
-  for (const int signal : kWaking) sigaddset(&handled, signal);
-  gEditor = pthread_self();
-  pthread_sigmask(SIG_BLOCK, &handled, &signalsBefore);
-  handle(kEnding, onEndingSignal, gEndingBefore);
-  handle(kWaking, onWakingSignal, gWakingBefore);
-  becomeBusy();
-  readSettings(gBefore);
-  gIsEditing = true;
+  sigset_t all;
+  sigfillset(&all);
+  pthread_sigmask(SIG_SETMASK, &all, &signalsBefore);
+  for (const int signal : ending) handle(signal, SA_RESETHAND | SA_NODEFER, onEnding);
+  for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, onWaking);
+  enter();
 }
 
 TerminalSession::~TerminalSession() {
-  if (gIsEditing) apply(TCSADRAIN, gBefore);
-  gIsEditing = false;
-  handleAsBefore(kWaking, gWakingBefore);
-  handleAsBefore(kEnding, gEndingBefore);
-  gIsBusy = false;
+  leave();
+  for (const int signal : ending) handle(signal, 0, SIG_DFL);
+  for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, SIG_DFL);
   pthread_sigmask(SIG_SETMASK, &signalsBefore, nullptr);
 }
 
-TerminalSession::Event TerminalSession::wait(int milliseconds) {
-  if (gIsEditing) tcgetattr(STDIN_FILENO, &gEditing);
-  pollfd input = {.fd = STDIN_FILENO, .events = POLLIN, .revents = 0};
-  const timespec limit = {.tv_sec = milliseconds / 1000,
-                          .tv_nsec = milliseconds % 1000 * 1'000'000L};
-  for (;;) {
-    gIsBusy = false;
-    const int ready = ppoll(&input, 1, milliseconds < 0 ? nullptr : &limit, &signalsBefore);
-    becomeBusy();
-    const bool wasResized = gWasResized.exchange(false);
-    const bool wasContinued = gWasContinued.exchange(false);
-    if (wasContinued || !gIsEditing) {
-      termios now{};
-      readSettings(now);
-      if ((now.c_lflag & ICANON) != 0) gBefore = now;
-      apply(TCSADRAIN, gEditing);
-      gIsEditing = true;
+/// Takes the terminal. In the background that stops the process until it is in the foreground.
+void TerminalSession::enter() {
+  {
+    const SignalMask now(signalsBefore);
+    while (tcdrain(STDIN_FILENO) != 0 && errno == EINTR) {
     }
-    if (wasContinued) return Event::continued;
-    if (wasResized) return Event::resized;
-    if (ready > 0) return Event::input;
-    if (ready == 0) return Event::timeout;
   }
+  gWasContinued = 0;
+  termios settings{};
+  tcgetattr(STDIN_FILENO, &settings);
+  if (gIsEditing == 0 || (settings.c_lflag & ICANON) != 0) gBefore = settings;
+  gIsEditing = 1;
+  settings = forEditing(gBefore);
+  tcsetattr(STDIN_FILENO, TCSANOW, &settings);
+  ioctl(STDIN_FILENO, FIONREAD, &typedAhead);
+  write(kMarkPastes);
+}
+
+TerminalSession::Event TerminalSession::wait(int milliseconds) {
+  pollfd input = {STDIN_FILENO, POLLIN, 0};
+  const timespec limit = {milliseconds / 1000, milliseconds % 1000 * 1'000'000L};
+  for (int ready = -1;;) {
+    if (gWasContinued != 0) {
+      enter();
+      return Event::continued;
+    }
+    if (gWasResized != 0) {
+      gWasResized = 0;
+      return Event::resized;
+    }
+    if (ready >= 0) return ready > 0 ? Event::input : Event::timeout;
+    ready = ppoll(&input, 1, milliseconds < 0 ? nullptr : &limit, &signalsBefore);
+  }
+}
+
+std::optional<char> TerminalSession::read() {
+  constexpr char kCtrlD = 4;
+  const SignalMask now(signalsBefore);
+  char byte = 0;
+  if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return std::nullopt;
+  const bool isAhead = typedAhead > 0;
+  if (isAhead) --typedAhead;
+  return isAhead && byte == '\0' ? kCtrlD : byte;
+}
+
+void TerminalSession::write(std::string_view text) {
+  const SignalMask now(signalsBefore);
+  std::ignore = posix::writeAll(STDOUT_FILENO, text);
+}
+
+TerminalSession::Size TerminalSession::size() const {
+  winsize size{};
+  ioctl(STDOUT_FILENO, TIOCGWINSZ, &size);
+  if (size.ws_row == 0 || size.ws_col == 0) return {24, 80};
+  return {size.ws_row, size.ws_col};
 }
 
 }  // namespace host

@@ -1,18 +1,28 @@
 #pragma once
 
 #include <csignal>
+#include <cstddef>
+#include <optional>
+#include <string_view>
+#include <vector>
+
+namespace host {
+
+/// The signals that, as their dispositions stand, end or stop the process when it is sent one: none
+/// that it ignores or handles, and none of a fault of its own.
+std::vector<int> endingSignals();
+
+/// Whether no other job has the terminal of standard input.
+bool hasTerminal();
 
 /// The terminal of standard input while a line is edited on it: the one place that knows what its
 /// settings were before, and sees to it that they are back whenever somebody else has the terminal.
 ///
-/// The signals that end or stop the process do so as ever, but after the settings are back; so does
-/// exit(3) on any thread. On the thread that edits they are blocked except while it waits for
-/// input, so that no change of the settings is under way then; on another thread they wait for
-/// that moment, a fifth of a second at most. Nothing is sent to any other process.
+/// The signals that end or stop the process do so as ever, but after the settings are back. They
+/// are blocked except while this waits or writes, so that no change of the settings is under way
+/// then. Nothing is sent to any other process.
 ///
-/// Threads: one session at a time, on one thread.
-namespace host {
-
+/// Threads: one session at a time, on one thread; the others block those signals.
 class TerminalSession {
  public:
   enum class Event {
@@ -21,8 +31,13 @@ class TerminalSession {
     resized,    ///< the terminal has, perhaps, another size
     continued,  ///< the process was stopped: the cursor is anywhere
   };
+  struct Size {
+    std::size_t rows;
+    std::size_t columns;
+  };
 
-  /// Waits until the process has the terminal, as a read would, and remembers the settings.
+  /// Waits until the process has the terminal, as a read would, and sets it to give each key as it
+  /// is typed, and a paste between marks.
   TerminalSession();
   TerminalSession(const TerminalSession&) = delete;
   TerminalSession& operator=(const TerminalSession&) = delete;
@@ -30,12 +45,24 @@ class TerminalSession {
   /// Puts the settings back.
   ~TerminalSession();
 
-  /// Waits for input for `milliseconds`, or without end for -1. The settings of the terminal that
-  /// it finds are those for editing; it sets them anew when the process goes on after a stop.
+  /// Waits for input for `milliseconds`, or without end for -1. The process has the terminal when
+  /// it returns.
   Event wait(int milliseconds);
 
+  /// The next byte, and no more: what follows the line may be for another program. None at the end
+  /// of the input. Ctrl-D that was typed before the session is one all the same: the system keeps
+  /// it as a NUL.
+  std::optional<char> read();
+
+  void write(std::string_view text);
+  Size size() const;
+
  private:
-  sigset_t signalsBefore{};
+  void enter();
+
+  const std::vector<int> ending = endingSignals();
+  sigset_t signalsBefore{};  // that were blocked
+  int typedAhead = 0;        // bytes
 };
 
 }  // namespace host

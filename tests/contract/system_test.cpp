@@ -18,7 +18,7 @@
 
 namespace {
 
-TEST(Files, AreEmptiedThenAppendedToAndOfOtherKindsLeftAsTheyAre) {
+TEST(Files, AreEmptiedThenAppendedTo) {
   const ScratchFolder folder;
   const auto path = folder.path("file");
   for (int round = 0; round < 2; ++round) {
@@ -30,11 +30,17 @@ TEST(Files, AreEmptiedThenAppendedToAndOfOtherKindsLeftAsTheyAre) {
     EXPECT_FALSE(file->write(std::string("\0three", 6)));
     EXPECT_EQ(readFile(path), std::string("one,two,\0three", 14));
   }
-  ASSERT_EQ(mkfifo(folder.path("pipe").c_str(), 0600), 0);
-  EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("pipe")), nullptr) << "nobody reads it";
+}
+
+TEST(Files, OfOtherKindsAreLeftAsTheyAre) {
+  const ScratchFolder folder;
+  const auto pipe = folder.path("pipe");
+  ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+  EXPECT_EQ(platform::FileHandle::createEmpty(pipe), nullptr) << "nobody reads it";
   EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("")), nullptr) << "a folder";
   const auto full = platform::FileHandle::createEmpty("/dev/full");
-  EXPECT_TRUE(!full || full->write("bytes") == std::errc::no_space_on_device);
+  if (!full) GTEST_SKIP() << "no /dev/full";
+  EXPECT_EQ(full->write("bytes"), std::errc::no_space_on_device);
 }
 
 TEST(StandardStreams, AreOpenIfTheyWereClosed) {

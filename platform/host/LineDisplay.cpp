@@ -1,0 +1,99 @@
+#include "platform/host/LineDisplay.h"
+
+#include <algorithm>
+#include <string>
+
+namespace host {
+
+/// Where the cells of a text stand, in rows of a number of columns.
+struct LineDisplay::Layout {
+  Layout(const std::vector<Cell>& cells, std::size_t columns) : cells(cells) {
+    std::size_t column = 0;
+    for (std::size_t i = 0; i < cells.size(); ++i) {
+      if (column > 0 && column + cells[i].columns > columns) {
+        starts.push_back(i);
+        column = 0;
+      }
+      column += cells[i].columns;
+    }
+    if (column >= columns) starts.push_back(cells.size());  // what comes next has a row of its own
+  }
+
+  /// The place of the cell at `index`, or of what comes after them all.
+  Place placeOf(std::size_t index) const {
+    const auto next = std::ranges::upper_bound(starts, index);
+    Place place = {static_cast<std::size_t>(next - starts.begin()) - 1, 0};
+    for (auto i = *std::prev(next); i < index; ++i) place.column += cells[i].columns;
+    return place;
+  }
+
+  const std::vector<Cell>& cells;
+  std::vector<std::size_t> starts = {0};  // of each row, its first cell
+};
+
+namespace {
+
+std::string control(std::size_t count, char function) {
+  return count > 0 ? "\033[" + std::to_string(count) + function : "";
+}
+
+}  // namespace
+
+/// What moves the cursor there. It counts columns from the left, so that a glyph that the terminal
+/// takes for wider or narrower does not matter beyond it.
+std::string LineDisplay::moving(Place from, Place to) {
+  if (from.row == to.row && from.column == to.column) return "";
+  return control(from.row - std::min(from.row, to.row), 'A') +
+         control(to.row - std::min(from.row, to.row), 'B') + '\r' + control(to.column, 'C');
+}
+
+void LineDisplay::draw(std::string_view text, std::size_t cursor) {
+  const auto [height, columns] = session.size();
+  auto cells = cellsOf(text);
+  auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
+  auto same = static_cast<std::size_t>(std::ranges::mismatch(drawn, cells).in1 - drawn.begin());
+  if (const Layout all(cells, columns); all.starts.size() > height) {
+    const auto last = std::max(all.placeOf(at).row + 1, height);
+    const auto first = all.starts[last - height];
+    if (last < all.starts.size()) cells.resize(all.starts[last]);
+    cells.erase(cells.begin(), cells.begin() + static_cast<std::ptrdiff_t>(first));
+    at -= first;
+    same = 0;
+  }
+
+  const Layout before(drawn, columns);
+  const Layout now(cells, columns);
+  std::string output = drawn.empty() ? "\r\033[J" : "";
+  output += moving(before.placeOf(drawnCursor), before.placeOf(same));
+  if (same < drawn.size()) output += "\033[J";
+  for (auto i = same; i < cells.size(); ++i) output += cells[i].glyph;
+  auto end = now.placeOf(cells.size());
+  if (end.row == height) {
+    --end.row;  // the last row is full, and the terminal waits for another glyph to go on
+  } else if (end.column == 0 && same < cells.size()) {
+    output += " \r";  // which is that glyph
+  }
+  output += moving(end, now.placeOf(at));
+  session.write(output);
+  drawn = std::move(cells);
+  drawnCursor = at;
+}
+
+void LineDisplay::clear() {
+  const Layout rows(drawn, session.size().columns);
+  session.write(moving(rows.placeOf(drawnCursor), {0, 0}));
+  forget();
+}
+
+void LineDisplay::forget() {
+  drawn.clear();
+  drawnCursor = 0;
+}
+
+void LineDisplay::append(std::string_view text) {
+  const Layout rows(drawn, session.size().columns);
+  session.write(moving(rows.placeOf(drawnCursor), rows.placeOf(drawn.size())) + std::string(text));
+  forget();
+}
+
+}  // namespace host
