@@ -59,14 +59,13 @@ Program::Program(const Start& start) {
   } else {
     out = output[0];
   }
-  type(start.input.value_or(""));
+  type(start.input);
 }
 
 void Program::execute(const Start& start, int input, int output) const {
   prctl(PR_SET_PDEATHSIG, SIGKILL);  // a test that is given up takes its program along
   if (!start.onTerminal) {
     dup2(input, STDIN_FILENO);
-    if (!start.input) close(STDIN_FILENO);
     dup2(output, STDOUT_FILENO);
     dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }

@@ -5,7 +5,6 @@
 
 #include <filesystem>
 #include <memory>
-#include <optional>
 #include <string>
 #include <vector>
 
@@ -28,13 +27,13 @@ void writeFile(const std::string& path, const std::string& text);
 
 /// One start of the real program.
 struct Start {
-  std::vector<std::string> words = {};               ///< after the program's name
-  std::string profile = {};                          ///< text of the device profile
-  std::optional<std::string> input = std::string();  ///< standard input; none: it is closed
-  std::string name = "zubtool";                      ///< under which the program is invoked
-  bool onTerminal = false;    ///< a pseudo-terminal stands for all three standard streams
-  std::string term = "dumb";  ///< the kind of terminal, TERM
-  std::string shell = {};     ///< a script of sh(1) with job control that runs it, as "$@"
+  std::vector<std::string> words = {};  ///< after the program's name
+  std::string profile = {};             ///< text of the device profile
+  std::string input = {};               ///< standard input
+  std::string name = "zubtool";         ///< under which the program is invoked
+  bool onTerminal = false;              ///< a pseudo-terminal stands for all three standard streams
+  std::string term = "dumb";            ///< the kind of terminal, TERM
+  std::string shell = {};  ///< a script of sh(1) with job control that runs it, as "$@"
 };
 
 /// What one run of the program left behind.

@@ -84,11 +84,10 @@ class CaseFile {
     const bool endsLine = !key.ends_with('+');
     if (!endsLine) key.pop_back();
     auto& [out, err, status, requests] = cases.back().expected;
-    auto& input = cases.back().start.input;
     const std::map<std::string, std::string*> texts = {
-        {"in", input ? &*input : nullptr}, {"out", &out}, {"err", &err}, {"request", &requests}};
+        {"in", &cases.back().start.input}, {"out", &out}, {"err", &err}, {"request", &requests}};
     const auto found = texts.find(key);
-    if (found == texts.end() || !found->second) throw std::runtime_error("no such key: " + key);
+    if (found == texts.end()) throw std::runtime_error("no such key: " + key);
     if (inherited.erase(key) > 0) found->second->clear();
     *found->second += text + (endsLine ? "\n" : "");
   }

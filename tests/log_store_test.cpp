@@ -21,7 +21,6 @@
 #include "platform/host/log/StreamEnd.h"
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
-#include "platform/posix/files.h"
 #include "platform/system.h"
 #include "tests/Program.h"
 #include "tests/StreamRun.h"

@@ -18,7 +18,7 @@
 #include "logdump/OsLogCommand.h"
 #include "oslog/OsLogStream.h"
 #include "platform/oslog_store.h"
-#include "platform/posix/files.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/system.h"
 #include "tests/Program.h"
 #include "tests/Table.h"

@@ -10,7 +10,7 @@
 #include <cerrno>
 #include <tuple>
 
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 namespace {

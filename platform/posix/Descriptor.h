@@ -1,7 +1,11 @@
 #pragma once
 
+#include <sys/types.h>
 #include <unistd.h>
 
+#include <string>
+#include <string_view>
+#include <system_error>
 #include <utility>
 
 namespace posix {
@@ -29,5 +33,25 @@ class Descriptor {
  private:
   int number;
 };
+
+/// Whether the device itself reads the file at `path`, which then must not be written. The port
+/// defines it.
+bool isReadByDevice(const std::string& path);
+
+/// Opens the file at `path` for writing at its end, or creates it with `mode`. The descriptor does
+/// not block. Fails for a file that the device reads, and for a pipe that nobody reads: it never
+/// waits. On failure it returns none, with the reason in `errno`.
+Descriptor openForAppending(const std::string& path, mode_t mode);
+
+// read(2) and write(2) for descriptors that may be shared with other programs, which may have made
+// them not block. They wait until the descriptor is ready, without end and without changing it.
+
+/// Writes all of `bytes`, with one system call where the system takes them whole; the rest of a
+/// short write follows. Returns the error, if any: it is then not known how much was written.
+[[nodiscard]] std::error_code writeAll(int descriptor, std::string_view bytes);
+
+/// Reads at most `size` bytes into `buffer` and returns their number, 0 at the end of the input. An
+/// error counts as the end.
+[[nodiscard]] std::size_t readSome(int descriptor, char* buffer, std::size_t size);
 
 }  // namespace posix

@@ -1,12 +1,7 @@
-#include "platform/posix/files.h"
-
-#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <cerrno>
-
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/system.h"
 
 namespace platform {
@@ -42,18 +37,3 @@ std::unique_ptr<FileHandle> FileHandle::createEmpty(const std::string& path) {
 }
 
 }  // namespace platform
-
-posix::Descriptor posix::openForAppending(const std::string& path, mode_t mode) {
-  if (path.find('\0') != std::string::npos) {  // the system would open another file
-    errno = EINVAL;
-    return Descriptor();
-  }
-  if (isReadByDevice(path)) {
-    errno = EPERM;
-    return Descriptor();
-  }
-  // Always with O_CREAT: the system then refuses a file that others have planted in a sticky
-  // directory.
-  return Descriptor(
-      open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, mode));
-}

@@ -5,7 +5,7 @@
 #include <iostream>
 #include <streambuf>
 
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/system.h"
 
 namespace {

@@ -8,7 +8,7 @@
 #include <mutex>
 
 #include "platform/oslog_store.h"
-#include "platform/posix/files.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/system.h"
 #include "platform/telephony.h"
 #include "platform/zub_client.h"

@@ -18,7 +18,7 @@
 
 namespace {
 
-TEST(Files, AreEmptiedThenAppendedTo) {
+TEST(Files, AreEmptiedThenAppendedToAndOfOtherKindsLeftAsTheyAre) {
   const ScratchFolder folder;
   const auto path = folder.path("file");
   for (int round = 0; round < 2; ++round) {
@@ -30,17 +30,11 @@ TEST(Files, AreEmptiedThenAppendedTo) {
     EXPECT_FALSE(file->write(std::string("\0three", 6)));
     EXPECT_EQ(readFile(path), std::string("one,two,\0three", 14));
   }
-}
-
-TEST(Files, OfOtherKindsAreLeftAsTheyAre) {
-  const ScratchFolder folder;
-  const auto pipe = folder.path("pipe");
-  ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
-  EXPECT_EQ(platform::FileHandle::createEmpty(pipe), nullptr) << "nobody reads it";
+  ASSERT_EQ(mkfifo(folder.path("pipe").c_str(), 0600), 0);
+  EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("pipe")), nullptr) << "nobody reads it";
   EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("")), nullptr) << "a folder";
   const auto full = platform::FileHandle::createEmpty("/dev/full");
-  if (!full) GTEST_SKIP() << "no /dev/full";
-  EXPECT_EQ(full->write("bytes"), std::errc::no_space_on_device);
+  EXPECT_TRUE(!full || full->write("bytes") == std::errc::no_space_on_device);
 }
 
 TEST(StandardStreams, AreOpenIfTheyWereClosed) {

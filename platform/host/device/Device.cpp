@@ -7,8 +7,8 @@
 #include <cstring>
 #include <fstream>
 
+#include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
-#include "platform/posix/transfer.h"
 
 namespace host {
 namespace {

@@ -6,8 +6,7 @@
 #include <system_error>
 
 #include "platform/host/device/Device.h"
-#include "platform/posix/files.h"
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 
 namespace host {
 namespace {
@@ -52,20 +51,12 @@ void recordRequest(const std::string& line) {
 
 TelephonyLumo::Result answerWith(const Answer& answer, std::string_view key, std::string value,
                                  lumo::object* reply) {
+  using Kind = Answer::Kind;
+  if (answer.kind == Kind::error)
+    return {answer.code, "the device profile makes this request fail"};
   lumo::dict entries;
-  switch (answer.kind) {
-    case Answer::Kind::error:
-      return {answer.code, "the device profile makes this request fail"};
-    case Answer::Kind::nullReply:
-      *reply = {};
-      return {};
-    case Answer::Kind::emptyReply:
-      break;
-    case Answer::Kind::value:
-      entries.set(key, std::move(value));
-      break;
-  }
-  *reply = std::move(entries);
+  if (answer.kind == Kind::value) entries.set(key, std::move(value));
+  *reply = answer.kind == Kind::nullReply ? lumo::object() : lumo::object(std::move(entries));
   return {};
 }
 

@@ -17,7 +17,6 @@
 #include "platform/host/log/RecordedLogReader.h"
 #include "platform/host/log/SampleLog.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/files.h"
 
 namespace host {
 namespace {

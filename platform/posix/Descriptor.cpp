@@ -1,5 +1,6 @@
-#include "platform/posix/transfer.h"
+#include "platform/posix/Descriptor.h"
 
+#include <fcntl.h>
 #include <poll.h>
 #include <unistd.h>
 
@@ -18,6 +19,21 @@ bool isWorthRepeating(int error, int descriptor, short event) {
 }
 
 }  // namespace
+
+Descriptor openForAppending(const std::string& path, mode_t mode) {
+  if (path.find('\0') != std::string::npos) {  // the system would open another file
+    errno = EINVAL;
+    return Descriptor();
+  }
+  if (isReadByDevice(path)) {
+    errno = EPERM;
+    return Descriptor();
+  }
+  // Always with O_CREAT: the system then refuses a file that others have planted in a sticky
+  // directory.
+  return Descriptor(
+      open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, mode));
+}
 
 std::error_code writeAll(int descriptor, std::string_view bytes) {
   while (!bytes.empty()) {
