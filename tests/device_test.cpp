@@ -59,8 +59,9 @@ TEST(Profile, TakesWhatAPersonWouldWrite) {
 }
 
 TEST(Profile, KnowsProductsByName) {
-  std::map<std::string, int> products = {
-      {"Unknown", 0}, {"Phone", 1}, {"PhoneLarge", 2}, {"Tablet", 16}, {"TabletLarge", 17}};
+  std::map<std::string, int> products = {{"Unknown", 0}, {"Phone", 1},        {"PhoneLarge", 2},
+                                         {"Tablet", 16}, {"TabletLarge", 17}, {"31", 31},
+                                         {"46", 46}};
   for (int i = 0; i < 14; ++i) {
     products["Watch" + std::to_string(1 + i / 2) + (i % 2 == 0 ? "Small" : "Large")] = 32 + i;
   }
