@@ -110,13 +110,15 @@ TEST(Processes, RunUntilTheyEndAndNotUntilTheyAreReaped) {
 }
 
 TEST(RequestLog, SaysWhyItCannotBeWritten) {
-  for (const auto& [path, why] :
-       {std::pair("/", "Is a directory"), {"/dev/full", "No space left on device"}}) {
+  for (const auto& [path, shown, why] :
+       {std::tuple("no/e\u0301 \x1b]0;\xC2\x9B\x7F", "no/e\u0301 \\x1b]0;\\x9b\\x7f",
+                   "No such file or directory"),
+        {"/dev/full", "/dev/full", "No space left on device"}}) {
     host::device().requestLog = path;
     testing::internal::CaptureStderr();
     host::recordRequest("request");
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
-              std::string(path) + ": cannot write the request log: " + why + "\n");
+              std::string(shown) + ": cannot write the request log: " + why + "\n");
   }
 }
 
