@@ -60,9 +60,9 @@ inline constexpr auto kResultServerNotRunning = static_cast<std::int32_t>(0xE020
 /// The client library of the baseband manager server.
 ///
 /// Threads: handlers and completions run on the queue that the manager was made with, one at a
-/// time. They must not throw. Errors: a request's are in its result, also when there is no memory
-/// for its answer; an event for which there is none is lost. A call that lacks memory or a thread
-/// throws `std::bad_alloc` or `std::system_error`, and has sent nothing.
+/// time. They must not throw. Errors: those of a request are in its result, which is a failure too
+/// when there is no memory for the answer; an event for which there is none is lost. A call for
+/// which there is no memory or no thread throws `std::bad_alloc` or `std::system_error`.
 namespace zub::client {
 
 /// One client's connection to the server. Opaque; shared by handle.

@@ -1,14 +1,18 @@
 #include "platform/zub_client.h"
 
+#include <unistd.h>
+
 #include <map>
 #include <mutex>
 #include <new>
 #include <thread>
+#include <tuple>
 #include <utility>
 #include <vector>
 
 #include "platform/host/device/Device.h"
 #include "platform/host/device/Requests.h"
+#include "platform/posix/Descriptor.h"
 #include "platform/posix/SignalsBlocked.h"
 
 namespace zub {
@@ -65,13 +69,14 @@ class Manager {
     if (on && wereOff && !state.empty()) reportState();
   }
 
-  /// An event for which there is no memory is lost.
   void enterState(std::string entered) noexcept {
     const std::lock_guard lock(mutex);
     state = std::move(entered);
     try {
       if (eventsOn) reportState();
     } catch (const std::bad_alloc&) {
+      std::ignore =
+          posix::writeAll(STDERR_FILENO, "Not enough memory for an event of the server\n");
     }
   }
 
@@ -99,15 +104,6 @@ class Manager {
 };
 
 namespace {
-
-/// Keeps every manager, and so its handlers, until exit, as the contract says of the handlers.
-/// Never destroyed: queues outlive exit.
-void keepForGood(const std::shared_ptr<Manager>& manager) {
-  static auto* const mutex = new std::mutex;
-  static auto* const managers = new std::vector<std::shared_ptr<Manager>>;
-  const std::lock_guard lock(*mutex);
-  managers->push_back(manager);
-}
 
 /// Plays the server's steps. Those of time 0 have happened when this returns.
 void startServer(const std::shared_ptr<Manager>& manager) {
@@ -193,7 +189,11 @@ std::shared_ptr<Manager> CreateManager(const std::string& /*name*/, dispatch::qu
 
 void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler) {
-  keepForGood(manager);
+  // A manager stays, and so do its handlers. Never destroyed: queues outlive exit.
+  static auto* const mutex = new std::mutex;
+  static auto* const managers = new std::vector<std::shared_ptr<Manager>>;
+  const std::lock_guard lock(*mutex);
+  managers->push_back(manager);
   manager->addHandler(event, std::move(handler));
 }
 
