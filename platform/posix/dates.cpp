@@ -20,9 +20,8 @@ std::time_t wholeSeconds(OSLogDate date) {
 }  // namespace
 
 OSLogDate OSLogDate::now() {
-  using std::chrono::microseconds;
   const auto sinceEpoch = std::chrono::system_clock::now().time_since_epoch();
-  return OSLogDate(std::chrono::floor<microseconds>(sinceEpoch).count());
+  return OSLogDate(std::chrono::floor<std::chrono::microseconds>(sinceEpoch).count());
 }
 
 OSLogDate OSLogDate::addingSeconds(double seconds) const {
