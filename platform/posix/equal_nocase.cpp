@@ -1,6 +1,6 @@
 #include <algorithm>
 
-#include "platform/posix/Ascii.h"
+#include "platform/posix/Utf8.h"
 #include "platform/telephony.h"
 
 bool util::equal_nocase(std::string_view left, std::string_view right) {

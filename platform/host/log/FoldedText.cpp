@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <array>
 
-#include "platform/posix/Ascii.h"
 #include "platform/posix/Utf8.h"
 
 namespace host {

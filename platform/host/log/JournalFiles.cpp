@@ -12,7 +12,7 @@
 #include <system_error>
 #include <utility>
 
-#include "platform/posix/Ascii.h"
+#include "platform/posix/Utf8.h"
 
 namespace host {
 namespace {
