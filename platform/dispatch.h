@@ -10,18 +10,18 @@
 
 namespace dispatch {
 
-/// Counts work that is under way, so that one thread can wait until all of it has ended.
+/// Counts work in progress, so that a thread can wait for all of it.
 ///
-/// A copy is another reference to the same group; the group lives as long as any reference. A
-/// default-made group is empty: to enter it, leave it or wait on it does nothing.
+/// A copy refers to the same group, which lives as long as any reference. A default-constructed
+/// group is empty: entering it, leaving it and waiting for it do nothing.
 ///
-/// Threads: every member may be called from any thread. Each enter must be matched by exactly one
-/// leave; a leave without an enter ends the process. Prefer `membership`, which pairs them.
+/// Each enter must be matched by exactly one leave; a leave without an enter ends the process.
+/// Prefer `membership`, which pairs them. Threads: any.
 class group {
  public:
   group() = default;
 
-  /// A new group that nobody has entered, or an empty one when the system has no memory for it.
+  /// Returns a new group, or an empty one when there is no memory for it.
   static group create() noexcept;
 
   explicit operator bool() const noexcept { return state != nullptr; }
@@ -29,10 +29,10 @@ class group {
   void enter() const;
   void leave() const;
 
-  /// Blocks until every enter has been matched by a leave. Returns at once when there is none.
+  /// Blocks until every enter has been matched by a leave.
   void wait() const;
 
-  /// The same, for at most `timeout`. True when the group was left in time.
+  /// The same, for at most `timeout`. Returns false on a time-out.
   [[nodiscard]] bool wait(std::chrono::nanoseconds timeout) const;
 
  private:
@@ -40,10 +40,11 @@ class group {
   std::shared_ptr<State> state;
 };
 
-/// One enter of a group and the leave that belongs to it.
+/// An enter of a group and its leave.
 ///
-/// Enters when made or copied, leaves when destroyed; a move hands the membership over. Capture it
-/// by value in whatever does the work, and the group is left when the last copy of that has gone.
+/// Enters when constructed or copied, and leaves when destroyed; a move transfers the membership.
+/// Capture it by value in the callable that does the work: the group is left when the last copy of
+/// that callable is destroyed.
 class membership {
  public:
   explicit membership(group entered) : joined(std::move(entered)) { joined.enter(); }
@@ -59,17 +60,15 @@ class membership {
   group joined;
 };
 
-/// Can be called with `Arguments`, for a `Result`.
 template <class Callable, class Result, class... Arguments>
 concept callable_as = std::is_invocable_r_v<Result, Callable&, Arguments...>;
 
-/// A reference-counted callable, which may hold none: one made of a null pointer or of an empty
-/// `std::function` is empty.
+/// A reference-counted callable.
 ///
-/// A copy is another reference to the same callable, never a copy of what the callable has
-/// captured; the captures are destroyed with the last reference. Calling an empty block is an
-/// error of the caller's. Threads: references may be copied and dropped on any thread; what a call
-/// needs is the callable's own affair.
+/// A copy refers to the same callable and copies none of its captures, which are destroyed with the
+/// last reference. A block constructed from a null pointer or an empty `std::function` is empty,
+/// and must not be called. Threads: references may be copied and destroyed on any thread; calls are
+/// not synchronized.
 template <class Signature>
 class block;
 
@@ -97,23 +96,23 @@ class block<Result(Arguments...)> {
 
 /// Runs tasks one at a time, in the order in which they were given, on a thread of its own.
 ///
-/// A copy is another reference to the same queue; a default-made queue holds none, and drops what
-/// it is given. Threads: every member may be called from any thread, tasks included; two tasks
-/// never overlap. Lifetime: tasks already given still run after the last reference is gone; each
-/// is released before the next one starts. At process exit, tasks that have not run are dropped.
-/// Signals: the thread takes none that are sent to the process.
-/// Errors: a task must not throw; one that does ends the process. A queue whose thread cannot be
-/// started throws `std::system_error` when it is made.
+/// A copy refers to the same queue. A default-constructed queue is empty and discards its tasks.
+///
+/// Threads: any, also that of a task. Lifetime: the tasks given still run after the last reference
+/// is gone, but not after exit(3); each is destroyed before the next one starts. Signals: the
+/// thread takes none that are sent to the process. Errors: a task that throws ends the process.
 class queue {
  public:
   queue() = default;
 
-  /// A new queue. `label` names its thread in debuggers, as far as the system has room for it.
+  /// `label` names the thread in debuggers; the system may cut it. Throws `std::system_error` when
+  /// no thread can be started, and `std::bad_alloc`.
   explicit queue(std::string label);
 
   explicit operator bool() const noexcept { return worker != nullptr; }
 
-  /// Appends `task`, which must not be empty, and does not wait for it.
+  /// Appends `task`, which must not be empty, and returns at once. On `std::bad_alloc` the task
+  /// does not run.
   void async(block<void()> task) const;
 
   /// True when both refer to the same queue.

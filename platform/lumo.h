@@ -6,14 +6,14 @@
 #include <variant>
 #include <vector>
 
-/// The values that requests and replies are made of. Plain data, without errors.
+/// The values of requests and replies.
 namespace lumo {
 
 class object;
 struct entry;
 
-/// Text keys with their values, in the order in which the keys were first set. It owns the values:
-/// a reference to one is valid until the dictionary is changed or goes away.
+/// Maps texts to values, in the order in which the keys were first set. A reference to a value is
+/// valid until the dictionary is changed or destroyed.
 class dict {
  public:
   dict();
@@ -23,10 +23,10 @@ class dict {
   dict& operator=(dict&&) noexcept;
   ~dict();
 
-  /// Sets the value under `key`; a value that stood there is replaced and keeps its place.
+  /// Sets the value of `key`. A key that is set again keeps its place.
   void set(std::string_view key, object value);
 
-  /// The value under `key`, or the null object when there is none.
+  /// The value of `key`, or the null object when there is none.
   const object& get(std::string_view key) const;
 
   const std::vector<entry>& entries() const { return items; }
@@ -47,7 +47,7 @@ class object {
 
   bool isDict() const { return as<dict>() != nullptr; }
 
-  /// The value under `key` when this is a dictionary that has it, else the null object.
+  /// The value of `key` when this is a dictionary that has it, else the null object.
   const object& get(std::string_view key) const;
 
   /// The value as a `Type` (`std::string`, `bool`, `std::int64_t` or `dict`), owned by this

@@ -5,32 +5,34 @@
 #include <string_view>
 #include <system_error>
 
-/// The name under which the program was invoked, without its folder. Owned by the C library, as
-/// in getprogname(3) of the BSDs.
+/// The name under which the program was invoked, without its directory, as getprogname(3) of the
+/// BSDs returns it. The C library owns it.
 extern "C" const char* getprogname();
 
 namespace platform {
 
-/// Runs the event loop of the main thread, the only one to call it, and serves the platform's
-/// callbacks. Called with all signals blocked. In practice it does not return.
+/// Runs the platform's event loop on the main thread, the only one to call it, with all signals
+/// blocked. In practice it does not return.
 void runMainEventLoop();
 
-/// Makes the standard streams safe to use, before anything else is opened and while there is one
-/// thread: each that is closed becomes the null device, and a reader that goes away, or a limit to
-/// a file's size, costs the output and not the process.
+/// Prepares the standard streams. Called once, before any other file is opened or thread started.
 ///
-/// From then on std::cin, std::cout and std::cerr share nothing with the C library's streams. They
-/// wait for a descriptor that does not block; what is written stays in a buffer until a flush, on
-/// std::cerr as well, and goes out in one system call where it fits; what cannot be written is
-/// dropped, and the stream goes on. Throws `std::bad_alloc`. Called once.
+/// Opens the null device for each standard descriptor that is closed. Ignores SIGPIPE and SIGXFSZ:
+/// output that nobody reads, or that exceeds the limit of a file's size, is lost, and the process
+/// continues.
+///
+/// Gives std::cin, std::cout and std::cerr buffers of their own, apart from the C library's. They
+/// wait while a descriptor that does not block is not ready. Both outputs are buffered until a
+/// flush, and written with one system call where the buffer holds the text. Output that cannot be
+/// written is dropped, and the stream stays good. Throws `std::bad_alloc`.
 void openStandardStreams();
 
-/// A file open for writing at its end; it closes when destroyed.
+/// A file that is open for appending. The destructor closes it.
 class FileHandle {
  public:
-  /// Opens the file at `path` and empties it, or makes it, for its owner alone. A device or a pipe
-  /// is opened as it is. Null when any of that is not possible, which includes a pipe that nobody
-  /// reads, and what the device itself reads; such a file is left as it was. Never waits.
+  /// Creates the file at `path`, with access for its owner alone, or truncates it. Opens a device
+  /// or a pipe without changing it. Returns null on failure, and for a pipe that nobody reads and a
+  /// file that the device reads; neither is changed. Never waits.
   static std::unique_ptr<FileHandle> createEmpty(const std::string& path);
 
   FileHandle() = default;
@@ -38,13 +40,13 @@ class FileHandle {
   FileHandle& operator=(const FileHandle&) = delete;
   virtual ~FileHandle() = default;
 
-  /// Appends all of `bytes`, with nothing buffered, in one system call where the system takes them
-  /// so. Waits for a reader that is slow, without end. Returns what went wrong, if anything did;
-  /// how much was written then is not known.
+  /// Appends all of `bytes`, unbuffered, with one system call where the system takes them whole.
+  /// Waits for a slow reader without a time-out. Returns the error, if any; it is then not known
+  /// how much was written.
   [[nodiscard]] virtual std::error_code write(std::string_view bytes) = 0;
 };
 
-/// Writes `message` to the system log's default log object at error level. Never to the terminal.
+/// Writes `message` to the system log at error level, and never to the terminal.
 void logError(const std::string& message);
 
 }  // namespace platform

@@ -4,10 +4,10 @@
 #include <string>
 #include <string_view>
 
-/// The telephony utility library: what device this is, and a few tools of the telephony stack.
+/// The telephony utility library, which describes the device.
 ///
-/// Threads: every function may be called from any thread. None of them fails: a code that a device
-/// does not know is 0, any other answer false.
+/// Threads: any. No function fails: a code that the device does not know is 0, any other answer
+/// false.
 
 /// The products that the tool knows by name. The codes are those of the device's services; those of
 /// the watches follow one another.
@@ -39,7 +39,7 @@ inline constexpr int kTelephonyRadioVendorKOV = 2;
 /// The code of the product's cellular radio; 0 when it has none.
 int TelephonyRadiosGetRadio();
 
-/// The product's code: one of `TelephonyProduct`, or that of another product.
+/// The code of the product, which `TelephonyProduct` need not have.
 int TelephonyRadiosGetProduct();
 
 /// The code of the radio's vendor.
@@ -53,17 +53,17 @@ bool TelephonyUtilIsCarrierBuild();
 
 namespace tlu {
 
-/// A destination for a service's own log. Opaque.
+/// A destination for the log of a service. Opaque.
 class LogServer;
 
-/// True when a process with exactly this name runs.
+/// True when a process with exactly this name is running.
 bool isProcessRunning(const std::string& name);
 
 }  // namespace tlu
 
 namespace defaults::compression {
 
-/// How collected logs are packaged when nobody says otherwise: 0 none, 1 tar.gz, 2 tar.
+/// How collected logs are packaged by default: 0 not at all, 1 tar.gz, 2 tar.
 std::int32_t mode();
 
 /// Whether this device can compress logs at all.
@@ -73,7 +73,7 @@ bool supported();
 
 namespace util {
 
-/// True when the texts are equal but for the case of ASCII letters.
+/// True when the texts are equal, ignoring the case of ASCII letters.
 bool equal_nocase(std::string_view left, std::string_view right);
 
 }  // namespace util

@@ -17,8 +17,7 @@ struct Result {
 
 }  // namespace TelephonyLumo
 
-/// Names of the baseband manager server's protocol. The client library defines these objects and
-/// their texts.
+/// Names of the protocol of the baseband manager server. The client library defines them.
 namespace zub {
 
 extern const char* const kCommandGetTraceProperty;
@@ -65,39 +64,38 @@ inline constexpr auto kResultServerNotRunning = static_cast<std::int32_t>(0xE020
 /// which there is no memory or no thread throws `std::bad_alloc` or `std::system_error`.
 namespace zub::client {
 
-/// One client's connection to the server. Opaque; shared by handle.
+/// The connection of a client to the server. Opaque.
 class Manager;
 
-/// Receives an event's payload, which may be null, and a group of the library's own.
+/// Takes the payload of an event, which may be null, and a group that belongs to the library.
 using EventHandler = dispatch::block<void(lumo::object payload, dispatch::group)>;
 
-/// Receives the result of a request and its reply, a dictionary on success.
+/// Takes the result of a request and its reply, a dictionary on success.
 using Completion = dispatch::block<void(TelephonyLumo::Result result, lumo::object reply)>;
 
-/// Makes a manager for the client called `name`, with callbacks on `queue`. Never null. Its events
-/// are on, as after `EventsOn`.
+/// Makes a manager for the client called `name`, with callbacks on `queue`. Never null. Delivery of
+/// events is on.
 std::shared_ptr<Manager> CreateManager(const std::string& name, dispatch::queue queue);
 
-/// Calls `handler` for each event of that name from now on. The library keeps its reference to the
-/// handler until the process exits; events that were reported before are not repeated.
+/// Calls `handler` for each later event called `event`. The library keeps the handler until the
+/// process exits.
 void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler);
 
-/// Stops the delivery of events. Those that occur until it is started again are lost.
+/// Stops the delivery of events. Those that occur meanwhile are lost.
 void EventsOff(std::shared_ptr<Manager> manager);
 
-/// Starts the delivery of events. When they were off, a server that has reported a state reports
-/// it anew; when they were on already, nothing happens.
+/// Starts the delivery of events. A server that has reported a state then reports it again. Does
+/// nothing when delivery is on.
 void EventsOn(std::shared_ptr<Manager> manager);
 
-/// Sends `command` with `request` and blocks until it is answered, without a time-out. `*reply`,
-/// which is the caller's and comes in as the null object, holds the reply afterwards; a request
-/// that failed leaves it null.
+/// Sends `command` with `request` and blocks until the answer comes, without a time-out. `*reply`
+/// must be the null object; it receives the reply of a request that succeeded.
 TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                                      const lumo::dict& request, lumo::object* reply);
 
 /// Sends `command` with `request` and returns at once. `completion` runs once, on the manager's
-/// queue, and the library has released it before that queue takes its next task.
+/// queue, and is destroyed before the next task of that queue starts.
 void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request);
 

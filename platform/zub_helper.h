@@ -8,7 +8,7 @@
 #include "platform/telephony.h"
 #include "platform/zub_client.h"
 
-/// Names of the helper service's protocol; their texts are the client library's.
+/// Names of the protocol of the helper service. The client library defines them.
 namespace zub::helper {
 
 /// Identifies a task of the helper service. The tool uses 4, the system report.
@@ -22,18 +22,18 @@ extern const char* const kKeyTimestampString;
 
 namespace zub {
 
-/// A client of the privileged helper service, which also answers while the server is down.
+/// A client of the privileged helper service, which answers also while the server does not run.
 class HelperClient {
  public:
-  /// Makes a client called `name` that logs to `logServer`, which may be null. Null when the
-  /// service cannot be reached.
+  /// Makes a client called `name` that logs to `logServer`, which may be null. Returns null when
+  /// the service cannot be reached.
   static std::shared_ptr<HelperClient> create(const std::string& name,
                                               std::shared_ptr<tlu::LogServer> logServer);
 
   virtual ~HelperClient() = default;
 
-  /// Performs one task and blocks until it is done. `*reply`, which is the caller's and comes in as
-  /// an empty dictionary, holds the reply afterwards; a task that failed leaves it empty.
+  /// Performs a task and blocks until it is done. `*reply` must be an empty dictionary; it receives
+  /// the reply of a task that succeeded.
   virtual TelephonyLumo::Result perform(helper::TaskID task, const std::string& command,
                                         const lumo::dict& parameters, lumo::object* reply) = 0;
 };

@@ -15,7 +15,7 @@ struct Escape {
 
 bool isOctal(char letter) { return letter >= '0' && letter <= '7'; }
 
-/// What the backslash at the start of `text` begins.
+/// The escape sequence at the start of `text`, or the backslash itself.
 Escape firstEscape(std::string_view text) {
   constexpr std::string_view kLetters = "abfnrtv\\\"'";
   constexpr std::string_view kMeanings = "\a\b\f\n\r\t\v\\\"'";

@@ -9,11 +9,11 @@
 const char* getprogname() { return program_invocation_short_name; }
 
 void platform::runMainEventLoop() {
-  for (;;) pause();  // the callbacks of this platform run on threads of their own
+  for (;;) pause();  // callbacks run on other threads
 }
 
 void platform::logError(const std::string& message) {
   std::string text = message;
-  std::ranges::replace(text, '\0', '?');  // which would end it for syslog
+  std::ranges::replace(text, '\0', '?');  // which would end the text of syslog(3)
   syslog(LOG_ERR, "%s", text.c_str());
 }

@@ -9,7 +9,7 @@
 namespace posix {
 namespace {
 
-/// Whether a call that has failed with `error` is worth another try, once `descriptor` is ready for
+/// Whether to repeat a call that failed with `error`. Waits until `descriptor` is ready for
 /// `event`.
 bool isWorthRepeating(int error, int descriptor, short event) {
   if (error == EINTR) return true;
@@ -29,8 +29,8 @@ Descriptor openForAppending(const std::string& path, mode_t mode) {
     errno = EPERM;
     return Descriptor();
   }
-  // Always with O_CREAT: the system then refuses a file that others have planted in a sticky
-  // directory.
+  // Always with O_CREAT: the kernel then refuses another user's file in a sticky directory, see
+  // fs.protected_regular in proc(5).
   return Descriptor(
       open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_NONBLOCK | O_NOCTTY | O_CLOEXEC, mode));
 }

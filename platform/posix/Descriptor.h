@@ -10,7 +10,7 @@
 
 namespace posix {
 
-/// Owns an open file descriptor, or none (-1), and closes it.
+/// Owns an open file descriptor, or none (-1). The destructor closes it.
 class Descriptor {
  public:
   explicit Descriptor(int opened = -1) noexcept : number(opened) {}
@@ -25,7 +25,7 @@ class Descriptor {
 
   int get() const noexcept { return number; }
 
-  /// Leaves it open, to whoever owns it now.
+  /// Gives up the descriptor, which stays open.
   void release() noexcept { number = -1; }
 
   explicit operator bool() const noexcept { return number >= 0; }

@@ -4,9 +4,8 @@
 
 namespace posix {
 
-/// Blocks the signals that others send to the process on the calling thread for as long as this
-/// lives. A thread that is started meanwhile never takes them. Those that report a fault of the
-/// thread itself stay as they were.
+/// Blocks signals on the calling thread while this lives, and for good on the threads that it
+/// starts meanwhile. Signals that report a fault of the thread itself are not blocked.
 class SignalsBlocked {
  public:
   SignalsBlocked() {

@@ -13,15 +13,15 @@ struct Sequence {
   bool wellFormed;
 };
 
-/// The well-formed sequence at the start of `text`, or the maximal subpart of an ill-formed one,
-/// with the replacement character.
+/// The sequence at the start of `text`: of an ill-formed one its maximal subpart, with the
+/// replacement character for its code.
 Sequence firstSequence(std::string_view text) {
   constexpr std::array<unsigned char, 5> kLeadBits = {0, 0x7F, 0x1F, 0x0F, 0x07};
   const auto lead = static_cast<unsigned char>(text[0]);
   const std::size_t length = utf8Length(text[0]);
   if (length == 0) return {1, kReplacement, false};
   char32_t code = lead & kLeadBits[length];
-  // What excludes overlong forms, surrogates and the codes beyond U+10FFFF is the second byte.
+  // The second byte excludes overlong forms, surrogates and codes beyond U+10FFFF.
   unsigned char low = 0x80;
   unsigned char high = 0xBF;
   if (lead == 0xE0) low = 0xA0;
@@ -39,8 +39,7 @@ Sequence firstSequence(std::string_view text) {
   return {length, code, true};
 }
 
-/// Whether `text` is ASCII throughout. Without an exit from the loop, which makes it many bytes at
-/// a time.
+/// Whether all of `text` is ASCII. The loop has no early exit, so that it can be vectorized.
 bool isAscii(std::string_view text) {
   unsigned char seen = 0;
   for (const char byte : text) seen |= static_cast<unsigned char>(byte);

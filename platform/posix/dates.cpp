@@ -38,7 +38,7 @@ OSLogDate OSLogDate::addingSeconds(double seconds) const {
 }
 
 void OSLogDate::appendDescription(std::string& text) const {
-  // Of the events of a log, most come in the same second as the one before.
+  // Most events of a log have the same second as the event before.
   static thread_local std::time_t knownSeconds = kNever;
   static thread_local char known[sizeof "-290308-MM-DD HH:MM:SS +0000"];
   const std::time_t seconds = wholeSeconds(*this);
@@ -53,7 +53,7 @@ void OSLogDate::appendDescription(std::string& text) const {
 
 std::int32_t OSLogTimeZone::secondsFromGMT(OSLogDate date) const {
   if (fixed) return *fixed;
-  // Asking the C library takes its lock, and longer than all the rest of an event.
+  // The C library takes a lock, and longer than all the rest of an event.
   static thread_local std::time_t knownSeconds = kNever;
   static thread_local std::int32_t known;
   const std::time_t seconds = wholeSeconds(date);

@@ -38,7 +38,7 @@ void group::enter() const {
 
 void group::leave() const {
   if (!state) return;
-  // Notified under the lock: the waiter may drop the last other reference as soon as it runs.
+  // Notifies under the lock: the waiter may destroy the last other reference as soon as it runs.
   const std::lock_guard lock(state->mutex);
   if (state->entered == 0) std::abort();
   if (--state->entered == 0) state->left.notify_all();
@@ -52,7 +52,7 @@ void group::wait() const {
 
 bool group::wait(std::chrono::nanoseconds timeout) const {
   if (!state) return true;
-  constexpr std::chrono::nanoseconds kLongest = std::chrono::years(100);  // to which a clock adds
+  constexpr std::chrono::nanoseconds kLongest = std::chrono::years(100);  // the clock adds to it
   std::unique_lock lock(state->mutex);
   return state->left.wait_for(lock, std::min(timeout, kLongest),
                               [this] { return state->entered == 0; });
@@ -63,9 +63,9 @@ struct queue::Worker {
   std::mutex mutex;
   std::condition_variable changed;
   std::deque<block<void()>> waiting;
-  bool abandoned = false;  ///< the last reference has gone
+  bool abandoned = false;  ///< no reference is left
 
-  /// Runs tasks until the queue is abandoned and empty. Each task is released before the next wait.
+  /// Runs tasks until the queue is abandoned and empty.
   void run() {
     std::unique_lock lock(mutex);
     for (;;) {
@@ -95,7 +95,7 @@ queue::queue(std::string label) {
   label.resize(std::min(label.size(), kLongestThreadName));
   pthread_setname_np(thread.native_handle(), label.c_str());
   thread.detach();
-  // Counts the references to the queue alone; the thread has its own.
+  // Counts the references to the queue apart from that of the thread.
   worker = std::shared_ptr<Worker>(shared.get(), [shared](Worker* left) { left->abandon(); });
 }
 

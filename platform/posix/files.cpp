@@ -19,8 +19,8 @@ class AppendedFile final : public FileHandle {
   posix::Descriptor descriptor;
 };
 
-/// Empties what is open, unless it is a device or a pipe. Emptied by the descriptor that is then
-/// written, since its path may lead elsewhere by now.
+/// Truncates the file, unless it is a device or a pipe. Uses the descriptor that is then written:
+/// by now the path may lead to another file.
 bool empty(const posix::Descriptor& opened) {
   struct stat about = {};
   if (fstat(opened.get(), &about) != 0) return false;

@@ -12,7 +12,6 @@ namespace {
 
 constexpr std::size_t kBufferSize = 8192;
 
-/// Reads a descriptor.
 class InputBuffer final : public std::streambuf {
  public:
   explicit InputBuffer(int source) : descriptor(source) {}
@@ -28,8 +27,7 @@ class InputBuffer final : public std::streambuf {
   char buffer[kBufferSize];
 };
 
-/// Writes to a descriptor what it is given until a flush, in one call where the buffer holds it.
-/// What cannot be written is dropped, and counts as written: the stream goes on.
+/// Drops what cannot be written, so that the stream stays good.
 class OutputBuffer final : public std::streambuf {
  public:
   explicit OutputBuffer(int target) : descriptor(target) { setp(buffer, buffer + sizeof buffer); }

@@ -4,7 +4,7 @@
 
 #include "platform/host/device/Profile.h"
 
-/// The device that this library stands in for. There is one in a process.
+/// The device that this library simulates. A process has one.
 namespace host {
 
 /// The profile of the device. The first call reads the file that the environment variable
@@ -12,8 +12,8 @@ namespace host {
 /// process with status 255. Threads: any. A test may change the profile while nothing else runs.
 Profile& device();
 
-/// Writes `message` and a line end to standard error, with control characters as "\x1b". For what
-/// is wrong with the profile or with a file that it names.
+/// Writes `message` as a line to standard error, with control characters shown as "\x1b". For
+/// faults of the profile and of the files that it names.
 void complain(std::string_view message);
 
 }  // namespace host

@@ -21,7 +21,7 @@ Text trimmed(Text text) {
   return text.substr(first, text.find_last_not_of(kBlanks) - first + 1);
 }
 
-/// Cuts the next piece up to `separator` off the front of `text`.
+/// Removes the part of `text` up to `separator`, and returns it without the separator.
 Text takePiece(Text& text, char separator) {
   const auto end = std::min(text.find(separator), text.size());
   const auto piece = text.substr(0, end);
@@ -29,7 +29,7 @@ Text takePiece(Text& text, char separator) {
   return piece;
 }
 
-/// Reads all of `text` as a whole number, decimal or with 0x in front.
+/// Reads all of `text` as an integer, decimal or with the prefix 0x hexadecimal.
 template <class Number>
 bool readNumber(Text text, Number& number) {
   int base = 10;
@@ -54,7 +54,7 @@ bool readChoice(Text text, Value& value, std::initializer_list<std::pair<Text, V
   return true;
 }
 
-// How a value is read into the part of a profile that it sets.
+// Readers of a value, by the type of the part of a profile that it sets.
 
 bool read(Text text, int& number) { return readNumber(text, number); }
 
@@ -178,13 +178,13 @@ bool readLogPrepare(Text text, Profile& profile) {
   return read(text == "ok" ? Text() : text, profile.logPrepareError);
 }
 
-/// Reads the part of a profile that a value alone sets.
+/// Reads a value that sets nothing but `Part`.
 template <auto Part>
 bool readPart(Text text, Profile& profile) {
   return read(text, profile.*Part);
 }
 
-/// A path in a profile is taken from the profile's own folder.
+/// `path`, taken from the folder of the profile `file`.
 std::string besideProfile(Text path, const std::string& file) {
   const auto slash = file.rfind('/');
   if (path.starts_with('/') || slash == std::string::npos) return std::string(path);
@@ -193,7 +193,7 @@ std::string besideProfile(Text path, const std::string& file) {
 
 struct Key {
   Text name;
-  Text takes;  ///< for the message about a bad value
+  Text takes;  ///< the values, for a message
   bool (*read)(Text value, Profile& profile);
   bool mayBeEmpty = false;
 };

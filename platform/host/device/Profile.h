@@ -15,13 +15,13 @@ namespace host {
 struct Answer {
   enum class Kind { value, error, nullReply, emptyReply };
   Kind kind = Kind::value;
-  std::string text = {};  ///< as the profile has it
+  std::string text = {};  ///< what the profile says
   std::int32_t code = 0;  ///< of an error
 
   friend bool operator==(const Answer&, const Answer&) = default;
 };
 
-/// The server reports `state` at `at` after the manager is made.
+/// The server reports `state` when the manager is `at` old.
 struct ServerStep {
   std::chrono::milliseconds at;
   std::string state;
@@ -31,7 +31,7 @@ struct ServerStep {
 
 enum class Build { internal, carrier, customer };
 
-/// One device, as a profile describes it. The defaults are a phone on which everything works.
+/// A device as a profile describes it. The default is a phone on which everything works.
 struct Profile {
   std::string file;  ///< the path that the profile was read from; empty for none
 
@@ -43,7 +43,7 @@ struct Profile {
   std::int32_t compression = 1;
   bool compressionSupported = true;
   std::vector<std::string> processes = {"Orvalind", "modemd"};
-  bool hostProcesses = false;  ///< the processes of this machine run on the device as well
+  bool hostProcesses = false;  ///< the processes of this machine count as the device's
 
   std::vector<ServerStep> server = {{std::chrono::milliseconds(0), "Started"}};
   Answer systemLogsMode = {.text = "full"};
@@ -62,7 +62,7 @@ struct Profile {
   std::string log = "sample";   ///< "sample", "journal", or a path
   std::string logPrepareError;  ///< empty when the store can be prepared
   bool hasLogPath() const { return log != "sample" && log != "journal"; }
-  std::optional<unsigned long> logEnd = 5;  ///< the reason a stream ends with; none: it never ends
+  std::optional<unsigned long> logEnd = 5;  ///< the reason of a stream's end; none: it does not end
 
   friend bool operator==(const Profile&, const Profile&) = default;
 };
@@ -70,9 +70,9 @@ struct Profile {
 /// The keys that a profile may set.
 std::vector<std::string_view> profileKeys();
 
-/// Reads the text of a profile into `profile`, which keeps its defaults for keys that are not set.
-/// `file` is the profile's path, for messages and for the paths it takes from its own folder.
-/// Returns what is wrong as "FILE:LINE: what", or nothing when the profile is good.
+/// Reads `text`, the contents of the profile `file`, into `profile`. Keys that it does not set keep
+/// their values. The path of a log is relative to the folder of `file`. Returns the first fault as
+/// "FILE:LINE: what", or nothing.
 std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
                                         Profile& profile);
 

@@ -11,7 +11,7 @@
 namespace host {
 namespace {
 
-/// `text` in quotes, on one line, and with no way to look like what stands around it.
+/// `text` in quotation marks, on one line, so that it cannot be taken for what stands around it.
 std::string quoted(const std::string& text) {
   std::string line = "\"";
   for (const char byte : text) {
@@ -40,12 +40,13 @@ std::string describe(const lumo::dict& request) {
 }
 
 void recordRequest(const std::string& line) {
-  constexpr mode_t kForAll = 0666;  // less the process's file mode creation mask
+  constexpr mode_t kForAll = 0666;  // less the umask
   const auto& path = device().requestLog;
   if (path.empty()) return;
   const auto log = posix::openForAppending(path, kForAll);
   std::error_code failure(errno, std::generic_category());
-  if (log) failure = posix::writeAll(log.get(), line + '\n');  // at once: processes may share it
+  if (log)
+    failure = posix::writeAll(log.get(), line + '\n');  // with one write: processes may share it
   if (failure) complain(path + ": cannot write the request log: " + failure.message());
 }
 

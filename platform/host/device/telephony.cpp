@@ -22,8 +22,8 @@ bool TelephonyUtilIsCarrierBuild() { return host::device().build == host::Build:
 namespace tlu {
 namespace {
 
-/// What proc(5) says of the process with the folder `process`: "PID (NAME) STATE ...", where the
-/// name may hold anything. Its name, or nothing when it has ended and only waits to be reaped.
+/// The name of the process with the folder `process` of /proc, or nothing when it is a zombie. Its
+/// file stat holds "PID (NAME) STATE ...", where the name may hold anything; see proc(5).
 std::optional<std::string> nameOfRunning(const std::string& process) {
   std::string stat;
   std::getline(std::ifstream(process + "/stat"), stat, '\0');
@@ -37,7 +37,6 @@ std::optional<std::string> nameOfRunning(const std::string& process) {
   return std::string(host::processName(std::string_view(stat).substr(start, end - start), program));
 }
 
-/// Whether a process of this machine has that name.
 bool runsOnThisMachine(const std::string& name) {
   const std::unique_ptr<DIR, int (*)(DIR*)> folder(opendir("/proc"), closedir);
   if (!folder) return false;

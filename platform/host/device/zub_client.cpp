@@ -50,7 +50,7 @@ const char* const kKeyTimestampString = "TimestampString";
 
 namespace client {
 
-/// A connection to the simulated server, which reports the states of the profile's steps.
+/// A connection to the simulated server.
 class Manager {
  public:
   explicit Manager(dispatch::queue callbacks) : queue(std::move(callbacks)) {}
@@ -100,12 +100,12 @@ class Manager {
   std::mutex mutex;
   std::multimap<std::string, EventHandler> handlers;
   bool eventsOn = true;
-  std::string state;  ///< the last one that the server has reported; empty before the first
+  std::string state;  ///< as the server last reported it; empty before the first
 };
 
 namespace {
 
-/// Plays the server's steps. Those of time 0 have happened when this returns.
+/// Has the server report its states. Those of time 0 are reported when this returns.
 void startServer(const std::shared_ptr<Manager>& manager) {
   const auto start = std::chrono::steady_clock::now();
   auto steps = host::device().server;
@@ -143,7 +143,7 @@ TelephonyLumo::Result answerTraceProperty(const lumo::dict& request, lumo::objec
   return {kNoSuchRequest, "no such trace property"};
 }
 
-/// A request that has arrived. Whether the server runs is settled by then.
+/// A request, and whether the server ran when it arrived.
 struct Request {
   std::string command;
   lumo::dict entries;
@@ -155,8 +155,8 @@ Request arrive(Manager& manager, const std::string& command, const lumo::dict& e
   return {command, entries, manager.isServerRunning()};
 }
 
-/// Takes as long as the server does. Trace properties are settings of the device, answered without
-/// a server.
+/// Answers a request, after the delay of a dump. Trace properties are settings of the device, and
+/// need no server.
 TelephonyLumo::Result answer(const Request& request, lumo::object* reply) {
   if (request.command == kCommandGetTraceProperty) {
     return answerTraceProperty(request.entries, reply);
@@ -169,8 +169,7 @@ TelephonyLumo::Result answer(const Request& request, lumo::object* reply) {
                           reply);
 }
 
-/// The answer to a request that is under way on the queue. A task takes the completion from here,
-/// and so releases it after its call.
+/// The completion of a request and what it takes. The call destroys it, not the end of the task.
 struct Pending {
   Completion completion;
   TelephonyLumo::Result result;
@@ -189,7 +188,7 @@ std::shared_ptr<Manager> CreateManager(const std::string& /*name*/, dispatch::qu
 
 void RegisterEventHandler(std::shared_ptr<Manager> manager, const std::string& event,
                           EventHandler handler) {
-  // A manager stays, and so do its handlers. Never destroyed: queues outlive exit.
+  // Keeps the manager, and so its handlers. Never destroyed: queues outlive exit.
   static auto* const mutex = new std::mutex;
   static auto* const managers = new std::vector<std::shared_ptr<Manager>>;
   const std::lock_guard lock(*mutex);
@@ -213,7 +212,7 @@ void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command
   manager->queue.async([manager, pending, arrived = arrive(*manager, command, request)] {
     try {
       pending->result = answer(arrived, &pending->reply);
-      // After the events of the time that the answer took.
+      // The states that the server has reported meanwhile come first.
       manager->queue.async([pending] { pending->complete(); });
     } catch (const std::bad_alloc&) {
       pending->result = {kNoMemory, "no memory"};
