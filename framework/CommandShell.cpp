@@ -63,8 +63,9 @@ CommandShell::Outcome CommandShell::runGroup(std::list<std::string> words) {
     const auto word = TakeNextWord(words);
     if (word == "cd") return changeDirectory(words);
     if (currentCommand->isValidCommand(word)) {
-      const bool succeeded =
-          currentCommand->isAllowed(word) && currentCommand->execCommand(word, words);
+      if (!currentCommand->isAllowed(word)) return Outcome::failed;
+      const auto shown = showWork ? showWork() : nullptr;
+      const bool succeeded = currentCommand->execCommand(word, words);
       return succeeded ? Outcome::succeeded : Outcome::failed;
     }
     if (!currentCommand->isValidSubCommand(word)) {

@@ -27,8 +27,13 @@ class CommandShell {
 
   CommandShell() = default;
 
-  /// Reads lines with `readEdited`, or from std::cin if that is empty or returns no value.
-  explicit CommandShell(LineReader readEdited) : readEdited(std::move(readEdited)) {}
+  /// Shows that a handler runs until what it returns is released.
+  using WorkShower = std::function<std::shared_ptr<void>()>;
+
+  /// Reads lines with `readEdited`, or from std::cin if that is empty or returns no value. Calls
+  /// `showWork`, unless it is empty, before each run of a handler.
+  explicit CommandShell(LineReader readEdited, WorkShower showWork = {})
+      : readEdited(std::move(readEdited)), showWork(std::move(showWork)) {}
 
   CommandShell(const CommandShell&) = delete;
   CommandShell& operator=(const CommandShell&) = delete;
@@ -64,4 +69,5 @@ class CommandShell {
   std::shared_ptr<CommandBase> promptCommand;   // where the prompt stands; empty in a one-shot run
   std::shared_ptr<CommandBase> currentCommand;  // where the next word is looked up
   const LineReader readEdited;
+  const WorkShower showWork;
 };

@@ -33,7 +33,8 @@ extern "C" void* runShellThread(void* argument) {
   pthread_sigmask(SIG_SETMASK, &start.signals, nullptr);
   try {
     const auto commandLine = start.words;
-    const std::shared_ptr<CommandShell> shell(new ZUBShell(platform::readEditedLine));
+    const std::shared_ptr<CommandShell> shell(
+        new ZUBShell(platform::readEditedLine, platform::showWork));
     const bool succeeded = shell->run(commandLine);
     std::exit(succeeded ? EXIT_SUCCESS : EXIT_FAILURE);  // with the shell and its tree alive
   } catch (const std::bad_alloc&) {

@@ -48,7 +48,7 @@ std::string LineDisplay::moving(Place from, Place to) {
 }
 
 void LineDisplay::draw(std::string_view text, std::size_t cursor) {
-  const auto [height, columns] = session.size();
+  const auto [height, columns] = sizeOfTerminal();
   auto cells = cellsOf(text);
   auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
   auto same = static_cast<std::size_t>(std::ranges::mismatch(drawn, cells).in1 - drawn.begin());
@@ -80,7 +80,7 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
 }
 
 void LineDisplay::clear() {
-  const Layout rows(drawn, session.size().columns);
+  const Layout rows(drawn, sizeOfTerminal().columns);
   session.write(moving(rows.placeOf(drawnCursor), {0, 0}));
   forget();
 }
@@ -91,7 +91,7 @@ void LineDisplay::forget() {
 }
 
 void LineDisplay::append(std::string_view text) {
-  const Layout rows(drawn, session.size().columns);
+  const Layout rows(drawn, sizeOfTerminal().columns);
   session.write(moving(rows.placeOf(drawnCursor), rows.placeOf(drawn.size())) + std::string(text));
   forget();
 }

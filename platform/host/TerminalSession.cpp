@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <cstdlib>
 #include <tuple>
 
 #include "platform/posix/Descriptor.h"
@@ -29,7 +30,7 @@ volatile std::sig_atomic_t gWasContinued = 0;
 void leave() {
   if (gIsEditing == 0) return;
   gIsEditing = 0;
-  if (!hasTerminal()) return;
+  if (!hasTerminal(STDIN_FILENO)) return;
   tcsetattr(STDIN_FILENO, TCSANOW, &gBefore);
   pollfd output = {STDOUT_FILENO, POLLOUT, 0};
   if (::poll(&output, 1, 0) <= 0) return;
@@ -93,9 +94,22 @@ std::vector<int> endingSignals() {
   return ending;
 }
 
-bool hasTerminal() {
-  const pid_t owner = tcgetpgrp(STDIN_FILENO);
+bool hasTerminal(int descriptor) {
+  const pid_t owner = tcgetpgrp(descriptor);
   return owner < 0 || owner == getpgrp();
+}
+
+bool canMoveCursor(int descriptor) {
+  const char* const kind = std::getenv("TERM");
+  return kind != nullptr && *kind != '\0' && std::string_view(kind) != "dumb" &&
+         isatty(descriptor) != 0;
+}
+
+TerminalSize sizeOfTerminal() {
+  winsize size{};
+  ioctl(STDOUT_FILENO, TIOCGWINSZ, &size);
+  if (size.ws_row == 0 || size.ws_col == 0) return {24, 80};
+  return {size.ws_row, size.ws_col};
 }
 
 TerminalSession::TerminalSession() {
@@ -162,13 +176,6 @@ std::optional<char> TerminalSession::read() {
 void TerminalSession::write(std::string_view text) {
   const SignalMask now(signalsBefore);
   std::ignore = posix::writeAll(STDOUT_FILENO, text);
-}
-
-TerminalSession::Size TerminalSession::size() const {
-  winsize size{};
-  ioctl(STDOUT_FILENO, TIOCGWINSZ, &size);
-  if (size.ws_row == 0 || size.ws_col == 0) return {24, 80};
-  return {size.ws_row, size.ws_col};
 }
 
 }  // namespace host

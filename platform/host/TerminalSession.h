@@ -12,8 +12,19 @@ namespace host {
 /// that it ignores or handles, and none of a fault of its own.
 std::vector<int> endingSignals();
 
-/// Whether no other job has the terminal of standard input.
-bool hasTerminal();
+/// Whether no other job has the terminal of `descriptor`.
+bool hasTerminal(int descriptor);
+
+/// Whether `descriptor` is a terminal that can move its cursor: TERM is set, and is not "dumb".
+bool canMoveCursor(int descriptor);
+
+struct TerminalSize {
+  std::size_t rows;
+  std::size_t columns;
+};
+
+/// Of the terminal of standard output; 24 rows of 80 columns where it does not say.
+TerminalSize sizeOfTerminal();
 
 /// The terminal of standard input while a line is edited on it: the one place that knows what its
 /// settings were before, and sees to it that they are back whenever somebody else has the terminal.
@@ -30,10 +41,6 @@ class TerminalSession {
     timeout,    ///< nothing to read in time
     resized,    ///< the terminal has, perhaps, another size
     continued,  ///< the process was stopped: the cursor is anywhere
-  };
-  struct Size {
-    std::size_t rows;
-    std::size_t columns;
   };
 
   /// Waits until the process has the terminal, as a read would, and sets it to give each key as it
@@ -55,7 +62,6 @@ class TerminalSession {
   std::optional<char> read();
 
   void write(std::string_view text);
-  Size size() const;
 
  private:
   void enter();

@@ -3,7 +3,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cstdlib>
 #include <map>
 #include <string_view>
 #include <utility>
@@ -339,7 +338,7 @@ void Editor::list(const Candidates& candidates) {
     labels.push_back(host::cellsOf(note.empty() ? name : name + " (" + note + ')'));
     widest = std::max(widest, host::columnsOf(labels.back()) + 2);
   }
-  const auto [height, width] = session.size();
+  const auto [height, width] = host::sizeOfTerminal();
   const auto columns = std::max<std::size_t>(1, width / widest);
   const auto shown = std::min(labels.size(), columns * (height > 4 ? height - 3 : 1));
   std::string text = "\r\n";
@@ -353,17 +352,12 @@ void Editor::list(const Candidates& candidates) {
   display.append(text);
 }
 
-bool canEdit() {
-  const char* const kind = std::getenv("TERM");
-  return isatty(STDIN_FILENO) != 0 && isatty(STDOUT_FILENO) != 0 && kind != nullptr &&
-         *kind != '\0' && std::string_view(kind) != "dumb";
-}
-
 }  // namespace
 
 std::optional<bool> platform::readEditedLine(const std::string& prompt,
                                              const LineCompleter& complete, std::string& line) {
-  static const bool isEditing = canEdit();
+  static const bool isEditing =
+      host::canMoveCursor(STDIN_FILENO) && host::canMoveCursor(STDOUT_FILENO);
   if (!isEditing) return std::nullopt;
   static auto& memory =
       *new Memory;  // never destroyed, as nothing is that exit(3) would take from a thread

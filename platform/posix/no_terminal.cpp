@@ -1,3 +1,4 @@
+#include "platform/posix/Descriptor.h"
 #include "platform/terminal.h"
 
 std::optional<bool> platform::readEditedLine(const std::string& /*prompt*/,
@@ -5,3 +6,7 @@ std::optional<bool> platform::readEditedLine(const std::string& /*prompt*/,
                                              std::string& /*line*/) {
   return std::nullopt;
 }
+
+std::shared_ptr<void> platform::showWork() { return nullptr; }
+
+void posix::beforeOutput() {}

@@ -4,6 +4,7 @@
 #include <csignal>
 #include <iostream>
 #include <streambuf>
+#include <tuple>
 
 #include "platform/posix/Descriptor.h"
 #include "platform/system.h"
@@ -48,7 +49,11 @@ class OutputBuffer final : public std::streambuf {
   }
 
  private:
-  void write(std::string_view bytes) { static_cast<void>(posix::writeAll(descriptor, bytes)); }
+  void write(std::string_view bytes) {
+    if (bytes.empty()) return;
+    posix::beforeOutput();
+    std::ignore = posix::writeAll(descriptor, bytes);
+  }
 
   const int descriptor;
   char buffer[kBufferSize];

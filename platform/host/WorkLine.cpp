@@ -1,0 +1,141 @@
+#include <poll.h>
+#include <sys/eventfd.h>
+#include <sys/ioctl.h>
+#include <sys/signalfd.h>
+#include <termios.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <chrono>
+#include <csignal>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <system_error>
+#include <thread>
+#include <tuple>
+
+#include "platform/host/TerminalSession.h"
+#include "platform/posix/Descriptor.h"
+#include "platform/posix/SignalsBlocked.h"
+#include "platform/terminal.h"
+
+namespace {
+
+using std::chrono::steady_clock;
+
+// Of the work under way, of which there is one at a time.
+std::mutex gMutex;
+bool gMayShow = false;
+bool gIsShown = false;
+
+void print(const std::string& text) { std::ignore = posix::writeAll(STDOUT_FILENO, text); }
+
+/// Whether a line has been typed, which the terminal then shows.
+bool wasLineTyped() {
+  int bytes = 0;
+  termios settings{};
+  return tcgetattr(STDIN_FILENO, &settings) == 0 && (settings.c_lflag & ECHO) != 0 &&
+         ioctl(STDIN_FILENO, FIONREAD, &bytes) == 0 && bytes > 0;
+}
+
+void clear() {
+  if (!gIsShown) return;
+  gIsShown = false;
+  if (host::hasTerminal(STDOUT_FILENO)) print(wasLineTyped() ? "\033[A\r\033[J" : "\r\033[K");
+}
+
+void stopShowing() {
+  const std::lock_guard lock(gMutex);
+  gMayShow = false;
+  clear();
+}
+
+/// "1:05", or "1:05, 1200 lines" once there are lines.
+std::string describe(std::chrono::seconds time, std::size_t lines) {
+  const auto seconds = std::to_string(time.count() % 60);
+  return std::to_string(time.count() / 60) + (seconds.size() < 2 ? ":0" : ":") + seconds +
+         (lines > 0 ? ", " + std::to_string(lines) + " lines" : "");
+}
+
+/// Shows a command that runs, from a thread which takes the signals that the shell thread has
+/// blocked meanwhile.
+class WorkLine {
+ public:
+  WorkLine() {
+    sigemptyset(&ending);
+    for (const int signal : host::endingSignals()) sigaddset(&ending, signal);
+    signals = posix::Descriptor(signalfd(-1, &ending, SFD_CLOEXEC | SFD_NONBLOCK));
+    over = posix::Descriptor(eventfd(0, EFD_CLOEXEC));
+    if (!signals || !over) throw std::system_error(errno, std::generic_category());
+    gMayShow = true;
+    thread = std::thread([this] { run(); });
+  }
+  WorkLine(const WorkLine&) = delete;
+  WorkLine& operator=(const WorkLine&) = delete;
+  ~WorkLine() {
+    stopShowing();
+    eventfd_write(over.get(), 1);
+    thread.join();
+  }
+
+ private:
+  void run() const {
+    pollfd ready[] = {{over.get(), POLLIN, 0}, {signals.get(), POLLIN, 0}};
+    for (auto next = begin + std::chrono::seconds(1);;) {
+      const auto left = std::chrono::ceil<std::chrono::milliseconds>(next - steady_clock::now());
+      ::poll(ready, 2, static_cast<int>(std::max<long>(left.count(), 0)));
+      if (ready[0].revents != 0) return;
+      if (ready[1].revents != 0) takeSignal();
+      if (steady_clock::now() < next) continue;
+      draw();
+      next += std::chrono::seconds(1);
+    }
+  }
+
+  void draw() const {
+    const std::lock_guard lock(gMutex);
+    if (!gMayShow || !host::hasTerminal(STDOUT_FILENO)) return;
+    if (wasLineTyped()) return clear();
+    const auto time = std::chrono::floor<std::chrono::seconds>(steady_clock::now() - begin);
+    const auto text = "running " + describe(time, posix::linesWritten() - linesBefore);
+    print("\r" + text.substr(0, host::sizeOfTerminal().columns - 1) + "\033[K");
+    gIsShown = true;
+  }
+
+  /// Has a signal do what it does by default.
+  void takeSignal() const {
+    signalfd_siginfo taken{};
+    if (::read(signals.get(), &taken, sizeof taken) != sizeof taken) return;
+    const std::lock_guard lock(gMutex);
+    clear();
+    sigset_t only;
+    sigemptyset(&only);
+    sigaddset(&only, static_cast<int>(taken.ssi_signo));
+    raise(static_cast<int>(taken.ssi_signo));
+    pthread_sigmask(SIG_UNBLOCK, &only, nullptr);  // here the process ends, or stops and goes on
+    pthread_sigmask(SIG_BLOCK, &only, nullptr);
+  }
+
+  const steady_clock::time_point begin = steady_clock::now();
+  const std::size_t linesBefore = posix::linesWritten();
+  const posix::SignalsBlocked here;  // and on the thread
+  sigset_t ending{};
+  posix::Descriptor signals;
+  posix::Descriptor over;
+  std::thread thread;
+};
+
+}  // namespace
+
+void posix::beforeOutput() { stopShowing(); }
+
+std::shared_ptr<void> platform::showWork() {
+  if (!host::canMoveCursor(STDOUT_FILENO) || !host::canMoveCursor(STDERR_FILENO)) return nullptr;
+  try {
+    return std::make_shared<WorkLine>();
+  } catch (const std::exception&) {  // no descriptor, no thread, no memory: nothing is shown
+    return nullptr;
+  }
+}
