@@ -13,6 +13,7 @@
 #include <csignal>
 #include <iostream>
 #include <random>
+#include <sstream>
 #include <tuple>
 
 #include "platform/terminal.h"
@@ -99,6 +100,12 @@ class Typist {
     }
   }
 
+  /// Where `mark` is in what is printed.
+  std::size_t await(const std::string& mark) {
+    while (printed.find(mark) == std::string::npos) look();
+    return printed.find(mark);
+  }
+
   /// The line that arrives next, and what is shown until then.
   std::string line() {
     std::size_t size = 0;
@@ -140,12 +147,6 @@ class Typist {
       std::ignore = write(lines, &size, sizeof size);
       std::ignore = write(lines, line.data(), size);
     }
-  }
-
-  /// Where `mark` is in what is printed.
-  std::size_t await(const std::string& mark) {
-    while (printed.find(mark) == std::string::npos) look();
-    return printed.find(mark);
   }
 
   /// Takes what is printed, of which there is more soon.
@@ -232,27 +233,27 @@ class Model {
     };
     if (key == "\001") cursor = 0;
     if (key == "\005") cursor = line.size();
-    if (key == "\033[D") cursor = left();
-    if (key == "\033[C") cursor = right();
-    if (key == "\033b") cursor = wordLeft();
-    if (key == "\033f") cursor = wordRight();
-    if (key == "\177") erase(left(), cursor);
-    if (key == "\033[3~" || key == "\004") erase(cursor, right());
+    if (key == "\033[D") cursor = next(-1);
+    if (key == "\033[C") cursor = next(1);
+    if (key == "\033b") cursor = nextWord(-1);
+    if (key == "\033f") cursor = nextWord(1);
+    if (key == "\177") erase(next(-1), cursor);
+    if (key == "\033[3~" || key == "\004") erase(cursor, next(1));
     if (key == "\013") kill(cursor, line.size(), false);
-    if (key == "\033d") kill(cursor, wordRight(), false);
+    if (key == "\033d") kill(cursor, nextWord(1), false);
     if (key == "\025") kill(0, cursor, true);
-    if (key == "\027") kill(wordLeft(), cursor, true);
+    if (key == "\027") kill(nextWord(-1), cursor, true);
     if (key == "\031") insert(killed);
     if (key == "\033[A") show(place > 0 ? place - 1 : 0);
     if (key == "\033[B") show(std::min(place + 1, lines.size() - 1));
     if (key == kSearch) search("a");
     if (key == kPaste) insert("a z");
     if (key == "\024" && cursor > 0) {
-      if (cursor == line.size()) cursor = left();
-      const auto text = erase(cursor, right());
-      cursor = left();
+      if (cursor == line.size()) cursor = next(-1);
+      const auto text = erase(cursor, next(1));
+      cursor = next(-1);
       insert(text);
-      cursor = right();
+      cursor = next(1);
     }
     if (key[0] < 0 || (key[0] >= ' ' && key[0] != 0x7F)) insert(key);
   }
@@ -285,7 +286,7 @@ class Model {
   }
 
   std::string erase(std::size_t from, std::size_t to) {
-    const auto text = line.substr(from, to - from);
+    auto text = line.substr(from, to - from);
     line.erase(from, to - from);
     cursor = from;
     return text;
@@ -296,32 +297,26 @@ class Model {
            ((line[at] & 0xC0) != 0x80 && line.compare(at, 2, "\xCC\x81") != 0);
   }
 
-  std::size_t left() const {
-    std::size_t at = cursor;
-    while (at > 0 && !isStart(--at)) {
+  /// The next place to the left, or right, that `isThere`, or the end on that side.
+  std::size_t reach(int step, auto isThere) const {
+    auto at = cursor;
+    while (at != (step < 0 ? 0 : line.size())) {
+      at += static_cast<std::size_t>(step);
+      if (isThere(at)) break;
     }
     return at;
   }
 
-  std::size_t right() const {
-    std::size_t at = cursor;
-    while (at < line.size() && !isStart(++at)) {
-    }
-    return at;
+  std::size_t next(int step) const {
+    return reach(step, [this](std::size_t at) { return isStart(at); });
   }
 
-  std::size_t wordLeft() const {
-    std::size_t at = cursor;
-    while (at > 0 && line[at - 1] == ' ') --at;
-    while (at > 0 && line[at - 1] != ' ') --at;
-    return at;
-  }
-
-  std::size_t wordRight() const {
-    std::size_t at = cursor;
-    while (at < line.size() && line[at] == ' ') ++at;
-    while (at < line.size() && line[at] != ' ') ++at;
-    return at;
+  std::size_t nextWord(int step) const {
+    const auto isBlank = [this](std::size_t at) { return line[at] == ' '; };
+    return reach(step, [&](std::size_t at) {
+      return at > 0 && at < line.size() && isBlank(step < 0 ? at - 1 : at) &&
+             !isBlank(step < 0 ? at : at - 1);
+    });
   }
 
   void show(std::size_t at) {
@@ -354,41 +349,15 @@ TEST(EditedLine, IsWhatAModelOfTheKeysPredicts) {
   std::cout << "ZUB_SEED=" << seed << " ZUB_LINES=" << count << std::endl;
   std::mt19937 random(static_cast<unsigned>(seed));
   const auto below = [&random](std::size_t limit) { return random() % limit; };
-  const std::vector<std::string> keys = {"\001",
-                                         "\005",
-                                         "\033[D",
-                                         "\033[C",
-                                         "\033b",
-                                         "\033f",
-                                         "\177",
-                                         "\033[3~",
-                                         "\013",
-                                         "\033d",
-                                         "\025",
-                                         "\027",
-                                         "\031",
-                                         "\033[A",
-                                         "\033[B",
-                                         Model::kSearch,
-                                         Model::kPaste,
-                                         "\024",
-                                         "\004",
-                                         "\t",
-                                         "\014",
-                                         "\037",
-                                         "\033[15~",
-                                         "\033[<0;3;4M",
-                                         "a",
-                                         "b c",
-                                         " ",
-                                         "\xC3\xA9",
-                                         "\xE4\xB8\x96",
-                                         "\xCC\x81",
-                                         "\xFF",
-                                         std::string(300, 'y'),
-                                         std::string(70, 'z')};
+  std::istringstream list(
+      "\001|\005|\033[D|\033[C|\033b|\033f|\177|\033[3~|\013|\033d|\025|\027|\031|\033[A|\033[B|"
+      "\024|\004|"
+      "\t|\014|\037|\033[15~|\033[<0;3;4M|a|b c| |\xC3\xA9|\xE4\xB8\x96|\xCC\x81|\xFF|" +
+      std::string(300, 'y') + '|' + Model::kSearch + '|' + Model::kPaste);
+  std::vector<std::string> keys;
+  for (std::string key; std::getline(list, key, '|');) keys.push_back(key);
   const auto someSize = [&below] {
-    const auto limit = below(2) == 0 ? 1 : 5;
+    const std::size_t limit = below(2) == 0 ? 1 : 5;
     return winsize{.ws_row = static_cast<unsigned short>(2 + below(10 * limit - 1)),
                    .ws_col = static_cast<unsigned short>(4 + below(40 * limit - 3)),
                    .ws_xpixel = 0,
@@ -418,6 +387,18 @@ TEST(EditedLine, IsWhatAModelOfTheKeysPredicts) {
     EXPECT_EQ(typist.ended(), 7);
     EXPECT_TRUE(isAsItWas(typist.terminal));
   }
+}
+
+TEST(EditedLine, IsDrawnAnewWhenTheTerminalHasAnotherSize) {
+  Typist typist("xterm-256color", kUsual);
+  const std::string text(75, 'r');
+  typist.type(text);
+  typist.await(text);
+  const winsize narrow = {.ws_row = 6, .ws_col = 30, .ws_xpixel = 0, .ws_ypixel = 0};
+  ioctl(typist.terminal, TIOCSWINSZ, &narrow);
+  typist.type("z\001t T\b \005\r");
+  EXPECT_EQ(typist.line(), "t  " + text + 'z');
+  EXPECT_EQ(shown(typist.before, 30), "> t  " + text + 'z');
 }
 
 TEST(EditedLine, LeavesTheTerminalAsItWasWhateverSignalEndsIt) {
@@ -485,22 +466,6 @@ TEST_F(Terminal, ShowsNothingOfWorkThatASignalEnds) {
   const auto outcome = program->finish();
   EXPECT_EQ(outcome.out, "\r\033[K");
   EXPECT_EQ(outcome.status, 1000 + SIGTERM);
-}
-
-TEST_F(Terminal, IsDrawnAnewWhenItsSizeChanges) {
-  const std::string reason(50, 'r');
-  program->type("tel " + reason.substr(1));
-  read(reason.substr(1));
-  const winsize size = {.ws_row = 4, .ws_col = 30, .ws_xpixel = 0, .ws_ypixel = 0};
-  ioctl(program->terminal(), TIOCSWINSZ, &size);
-  read(kPrompt);
-  program->type("r\001logdump \t\r");
-  read(kPath);  // after the line has perhaps been drawn twice
-  read(kPrompt);
-  EXPECT_EQ(shown(printed, 30),
-            kPrompt + kTel + reason + "\nbb\n... 5 more\n" + shownFor(kTel + reason) + kAtTheEnd);
-  program->type("\004");
-  expectEnd();
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {

@@ -18,6 +18,7 @@ namespace {
 
 constexpr std::string_view kMarkPastes = "\033[?2004h";
 constexpr std::string_view kMarkNoPastes = "\033[?2004l";
+constexpr int kOnce = static_cast<int>(SA_RESETHAND | SA_NODEFER);  // a signal is handled
 
 // A signal handler has no other way to what it needs.
 termios gBefore{};                          // settings to go back to
@@ -51,7 +52,7 @@ extern "C" void onEnding(int signal) {
   const int errorBefore = errno;
   leave();
   raise(signal);  // here the process ends, or stops and goes on
-  handle(signal, SA_RESETHAND | SA_NODEFER, onEnding);
+  handle(signal, kOnce, onEnding);
   gWasContinued = 1;
   errno = errorBefore;
 }
@@ -116,7 +117,7 @@ TerminalSession::TerminalSession() {
   sigset_t all;
   sigfillset(&all);
   pthread_sigmask(SIG_SETMASK, &all, &signalsBefore);
-  for (const int signal : ending) handle(signal, SA_RESETHAND | SA_NODEFER, onEnding);
+  for (const int signal : ending) handle(signal, kOnce, onEnding);
   for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, onWaking);
   enter();
 }
