@@ -1,10 +1,8 @@
 #include "platform/host/log/JournalFaults.h"
 
-#include <fcntl.h>
 #include <sys/mman.h>
 #include <unistd.h>
 
-#include <array>
 #include <cerrno>
 #include <cstdint>
 
@@ -14,64 +12,6 @@ namespace {
 // What the handler reads is set before it is installed. It may be called on any thread.
 constinit thread_local JournalFaults* ofThisThread = nullptr;
 struct sigaction before = {};
-
-/// Reads /proc/self/maps (see proc(5)) byte by byte, with nothing but system calls.
-class MapsFile {
- public:
-  MapsFile() : descriptor(::open("/proc/self/maps", O_RDONLY | O_CLOEXEC)) {}
-  MapsFile(const MapsFile&) = delete;
-  MapsFile& operator=(const MapsFile&) = delete;
-  ~MapsFile() {
-    if (descriptor >= 0) ::close(descriptor);
-  }
-
-  /// The next byte; 0 at the end.
-  char next() {
-    if (position == count) {
-      count = descriptor >= 0 ? ::read(descriptor, buffer.data(), buffer.size()) : 0;
-      position = 0;
-    }
-    return count > 0 ? buffer[static_cast<std::size_t>(position++)] : '\0';
-  }
-
-  /// The hexadecimal number at the position, and the byte after it, which is consumed.
-  std::uintptr_t nextNumber() {
-    std::uintptr_t number = 0;
-    for (;;) {
-      const char byte = next();
-      if (byte >= '0' && byte <= '9') {
-        number = number * 16 + static_cast<std::uintptr_t>(byte - '0');
-      } else if (byte >= 'a' && byte <= 'f') {
-        number = number * 16 + static_cast<std::uintptr_t>(byte - 'a' + 10);
-      } else {
-        return number;
-      }
-    }
-  }
-
- private:
-  int descriptor;
-  std::array<char, 4096> buffer{};
-  ssize_t position = 0;
-  ssize_t count = 0;
-};
-
-/// Whether `address` lies in a shared map of the process. A line is "START-END rwxs ...".
-bool isInSharedMap(const void* place) {
-  const auto address = reinterpret_cast<std::uintptr_t>(place);
-  MapsFile maps;
-  for (;;) {
-    const std::uintptr_t start = maps.nextNumber();
-    const std::uintptr_t end = maps.nextNumber();
-    if (end == 0) return false;
-    for (int i = 0; i < 3; ++i) maps.next();
-    const bool shared = maps.next() == 's';
-    if (address >= start && address < end) return shared;
-    for (char byte = maps.next(); byte != '\n'; byte = maps.next()) {
-      if (byte == '\0') return false;
-    }
-  }
-}
 
 /// Replaces the page around `address` by an empty one.
 bool putEmptyPage(void* address) {
@@ -97,8 +37,7 @@ JournalFaults::~JournalFaults() { ofThisThread = outer; }
 
 void JournalFaults::handle(int signal, siginfo_t* info, void* /*context*/) {
   const int error = errno;
-  if (ofThisThread != nullptr && info->si_code == BUS_ADRERR && isInSharedMap(info->si_addr) &&
-      putEmptyPage(info->si_addr)) {
+  if (ofThisThread != nullptr && info->si_code == BUS_ADRERR && putEmptyPage(info->si_addr)) {
     ofThisThread->faults = 1;
   } else {
     ::sigaction(signal, &before, nullptr);

@@ -4,17 +4,16 @@
 
 namespace host {
 
-/// Lets a thread read journal files through systemd's library, which maps them, while they are
-/// truncated. A page that is gone raises SIGBUS; as journalctl does, the handler puts an empty page
-/// there, and notes it.
+/// Lets a thread read journal files through systemd's library, which maps them, while others
+/// truncate them. Access to a page that is gone raises SIGBUS; the handler puts an empty page
+/// there, as journalctl does, and notes the fault.
 ///
-/// The handler of SIGBUS is installed with the first of these, and stays. It takes only a fault of
-/// a thread that has one, at an address in a shared map of a file, which is how the library maps
-/// journals and nothing else here is. Any other gives SIGBUS back to the handler before it, for
-/// good.
+/// The handler is installed with the first object, and stays. It takes a fault of a missing page
+/// (BUS_ADRERR) on a thread that has an object: such a thread maps no files but journals. Any other
+/// SIGBUS is left to the handler before it, from then on for good.
 ///
-/// Threads: it belongs to the thread that makes it. Of several on a thread, the last one takes the
-/// fault; they go in the opposite order.
+/// Threads: an object belongs to the thread that makes it. The last one made takes the faults;
+/// objects of one thread are destroyed in the opposite order.
 class JournalFaults {
  public:
   JournalFaults();
@@ -22,7 +21,7 @@ class JournalFaults {
   JournalFaults& operator=(const JournalFaults&) = delete;
   ~JournalFaults();
 
-  /// Whether a page was gone: what has been read since may be zeros.
+  /// Whether a page was gone. What has been read since may be zeros.
   bool any() const { return faults != 0; }
 
  private:
