@@ -43,27 +43,26 @@ void add(std::string& seen, std::string_view text) {
   seen.append(text).append("|");
 }
 
-void addAll(std::string& seen, const host::LogEvent& event, const host::EventFilter& filter) {
+void addAll(std::string& seen, const host::LogEntry& entry, const host::EventFilter& filter) {
+  const host::LogEvent event(entry);
   add(seen, event.process());
   add(seen, event.sender());
   add(seen, event.subsystem());
   add(seen, event.category());
   add(seen, event.composedMessage());
-  add(seen, event.senderImagePath());
   event.date().appendDescription(seen);
   seen += std::to_string(event.type() + event.threadIdentifier() + event.activityIdentifier());
   seen += std::to_string(event.processIdentifier());
   seen += std::to_string(event.timeZone().secondsFromGMT(event.date()));
-  seen += filter.passes(event) ? '+' : '-';
+  seen += filter.passes(entry) ? '+' : '-';
 }
 
 /// All that the log says.
 std::string read(std::string_view log, std::size_t piece, const host::EventFilter& filter) {
   host::RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
-  const host::LogEvent event(reader.entry());
   std::string seen;
   try {
-    while (reader.next() == EntryReader::Result::entry) addAll(seen, event, filter);
+    while (reader.next() == EntryReader::Result::entry) addAll(seen, reader.entry(), filter);
   } catch (const host::DamagedLog& damage) {
     seen += damage.what();
   }

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <stdexcept>
 
+#include "platform/host/log/LogEvent.h"
+
 namespace host {
 
 EventFilter::EventFilter(OSLogOrPredicate predicate) : everything(false) {
@@ -17,11 +19,10 @@ EventFilter::EventFilter(OSLogOrPredicate predicate) : everything(false) {
   }
 }
 
-bool EventFilter::passes(const LogEvent& event) const {
+bool EventFilter::passes(const LogEntry& entry) const {
   if (everything) return true;
-  if (!names.empty() && names.contains(event.process())) return true;
-  if (pathParts.empty()) return false;
-  const std::string_view path = event.senderImagePath();
+  if (!names.empty() && names.contains(processOf(entry))) return true;
+  const std::string_view path = imagePathOf(entry);
   return std::ranges::any_of(pathParts, [path](const FoldedText& part) { return part.isIn(path); });
 }
 

@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "platform/host/log/FoldedText.h"
-#include "platform/host/log/LogEvent.h"
+#include "platform/host/log/LogEntry.h"
 #include "platform/oslog_store.h"
 
 namespace host {
@@ -20,7 +20,8 @@ class EventFilter {
   /// `std::invalid_argument` for a format that `OSLogPredicate` does not list.
   explicit EventFilter(OSLogOrPredicate predicate);
 
-  bool passes(const LogEvent& event) const;
+  /// Whether it lets the event pass that `entry` stands for.
+  bool passes(const LogEntry& entry) const;
 
  private:
   bool everything = true;

@@ -15,6 +15,7 @@
 
 #include "platform/host/log/JournalFaults.h"
 #include "platform/host/log/Libsystemd.h"
+#include "platform/host/log/LogEvent.h"
 
 namespace host {
 namespace {
@@ -194,8 +195,7 @@ class JournalReader final : public EntryReader {
     // For each entry that a match lets pass, the library looks into the index of all the others,
     // which takes a fifth of the time of reading an entry that is not wanted.
     constexpr std::size_t kMostMatches = 16;
-    const LogEntry none;
-    if (filter.passes(LogEvent(none))) return true;  // needs no field to pass
+    if (filter.passes(LogEntry())) return true;  // needs no field to pass
     const std::vector<std::string> matches = findMatches();
     if (matches.size() > kMostMatches) return true;
     for (const std::string& match : matches) {
@@ -207,16 +207,14 @@ class JournalReader final : public EntryReader {
 
   std::vector<std::string> findMatches() {
     std::vector<std::string> matches;
-    LogEntry entry;
-    const LogEvent event(entry);
     const std::vector<std::string> images = uniqueValues(Field::exe);
     for (const Field field :
          {Field::comm, Field::syslogIdentifier, Field::exe, Field::senderPath}) {
       for (const std::string& value : uniqueValues(field)) {
-        entry = LogEntry();
+        LogEntry entry;
         entry.at(field) = value;
         const bool passes =
-            filter.passes(event) || (field == Field::comm && passesWhole(entry, images));
+            filter.passes(entry) || (field == Field::comm && passesWhole(entry, images));
         if (passes) matches.push_back(std::string(nameOf(field)) + '=' + value);
       }
     }
@@ -225,11 +223,10 @@ class JournalReader final : public EntryReader {
 
   /// Whether one of `images` makes a longer name of the process of `entry`, one that passes.
   bool passesWhole(LogEntry& entry, const std::vector<std::string>& images) const {
-    const LogEvent event(entry);
-    const std::string cut(event.process());
+    const std::string cut = processOf(entry);
     return std::ranges::any_of(images, [&](const std::string& image) {
       entry.at(Field::exe) = image;
-      return event.process() != cut && filter.passes(event);
+      return processOf(entry) != cut && filter.passes(entry);
     });
   }
 

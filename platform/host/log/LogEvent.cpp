@@ -1,6 +1,7 @@
 #include "platform/host/log/LogEvent.h"
 
 #include <charconv>
+#include <optional>
 
 #include "platform/host/ProcessName.h"
 #include "platform/posix/Utf8.h"
@@ -32,63 +33,49 @@ std::string_view firstOf(const LogEntry& entry, Fields... fields) {
   return {};
 }
 
-}  // namespace
-
-std::uint32_t LogEvent::type() const {
-  return number<std::uint32_t>(entry, Field::type).value_or(kOSLogEventTypeLogMessage);
-}
-
-OSLogTimeZone LogEvent::timeZone() const {
+OSLogTimeZone timeZoneOf(const LogEntry& entry) {
   const auto offset = number<std::int32_t>(entry, Field::gmtOffset);
   const bool sound = offset && *offset >= -kSecondsADay && *offset <= kSecondsADay;
   return sound ? OSLogTimeZone(*offset) : OSLogTimeZone();
 }
 
-std::uint64_t LogEvent::threadIdentifier() const {
-  return number<std::uint64_t>(entry, Field::tid, Field::pid).value_or(0);
+}  // namespace
+
+LogEvent::LogEvent(const LogEntry& entry)
+    : thread(number<std::uint64_t>(entry, Field::tid, Field::pid).value_or(0)),
+      activity(number<std::uint64_t>(entry, Field::activity).value_or(0)),
+      moment(entry.microseconds),
+      zone(timeZoneOf(entry)),
+      kind(number<std::uint32_t>(entry, Field::type).value_or(kOSLogEventTypeLogMessage)),
+      pid(number<std::int32_t>(entry, Field::pid, Field::syslogPid).value_or(0)) {
+  const std::string process = processOf(entry);
+  const std::string_view image = fileName(imagePathOf(entry));
+  const std::array<std::string_view, kTexts> parts = {
+      process, image.empty() ? process : image,
+      firstOf(entry, Field::subsystem, Field::systemdUnit, Field::transport),
+      firstOf(entry, Field::category, Field::syslogIdentifier), entry[Field::message]};
+  std::size_t most = 0;
+  for (const std::string_view part : parts) most += part.size();
+  texts.reserve(most);
+  std::string repaired;
+  for (std::size_t i = 0; i < kTexts; ++i) {
+    texts += posix::asUtf8(parts[i], repaired);
+    starts[i + 1] = texts.size();
+  }
 }
 
-std::uint64_t LogEvent::activityIdentifier() const {
-  return number<std::uint64_t>(entry, Field::activity).value_or(0);
+std::string processOf(const LogEntry& entry) {
+  std::string name;
+  std::string_view bytes = entry[Field::syslogIdentifier];
+  if (entry.has(Field::comm)) {
+    bytes = processName(unescaped(entry[Field::comm], name), entry[Field::exe]);
+  }
+  std::string repaired;
+  return std::string(posix::asUtf8(bytes, repaired));
 }
 
-std::int32_t LogEvent::processIdentifier() const {
-  return number<std::int32_t>(entry, Field::pid, Field::syslogPid).value_or(0);
-}
-
-std::string_view LogEvent::process() const { return utf8(Text::process, processBytes()); }
-
-std::string_view LogEvent::sender() const {
-  const std::string_view file = fileName(pathBytes());
-  return utf8(Text::sender, file.empty() ? processBytes() : file);
-}
-
-std::string_view LogEvent::subsystem() const {
-  return utf8(Text::subsystem,
-              firstOf(entry, Field::subsystem, Field::systemdUnit, Field::transport));
-}
-
-std::string_view LogEvent::category() const {
-  return utf8(Text::category, firstOf(entry, Field::category, Field::syslogIdentifier));
-}
-
-std::string_view LogEvent::composedMessage() const {
-  return utf8(Text::message, entry[Field::message]);
-}
-
-std::string_view LogEvent::senderImagePath() const { return utf8(Text::path, pathBytes()); }
-
-std::string_view LogEvent::processBytes() const {
-  if (!entry.has(Field::comm)) return entry[Field::syslogIdentifier];
-  return processName(unescaped(entry[Field::comm], name), entry[Field::exe]);
-}
-
-std::string_view LogEvent::pathBytes() const {
+std::string_view imagePathOf(const LogEntry& entry) {
   return firstOf(entry, Field::senderPath, Field::exe);
-}
-
-std::string_view LogEvent::utf8(Text which, std::string_view bytes) const {
-  return posix::asUtf8(bytes, repaired[static_cast<std::size_t>(which)]);
 }
 
 }  // namespace host

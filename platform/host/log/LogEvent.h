@@ -2,15 +2,17 @@
 
 #include <array>
 #include <cstddef>
-#include <optional>
+#include <cstdint>
 #include <string>
+#include <string_view>
 
 #include "platform/host/log/LogEntry.h"
 #include "platform/oslog_store.h"
 
 namespace host {
 
-/// The event that an entry of a log stands for.
+/// The event that an entry of a log stands for, with all its parts decoded. It is independent of
+/// the entry.
 ///
 /// Each part comes from a field, or from the next one in its line where the entry has no such
 /// field. A number that cannot be read, and an offset of more than a day, count as no field; a
@@ -19,42 +21,50 @@ namespace host {
 /// - type: LOG_TYPE, 1024
 /// - date: the entry's; time zone: LOG_GMTOFF (seconds), this machine's local zone
 /// - thread: TID, _PID, 0; activity: LOG_ACTIVITY, 0; process identifier: _PID, SYSLOG_PID, 0
-/// - process: _COMM (without journald's escapes, whole by way of _EXE), SYSLOG_IDENTIFIER
-/// - path of the image that logged: LOG_SENDER_PATH, _EXE; sender: its file name, the process
+/// - process: as `processOf`; sender: file name of the image as `imagePathOf`, the process
 /// - subsystem: LOG_SUBSYSTEM, _SYSTEMD_UNIT, _TRANSPORT; category: LOG_CATEGORY,
 ///   SYSLOG_IDENTIFIER
 /// - message: MESSAGE
-///
-/// An event is a view of an entry, which may change under it: it reports what the entry holds
-/// when it is asked. Texts are valid until the entry changes or the same text is asked for again.
 class LogEvent final : public OSLogEventProxy {
  public:
-  explicit LogEvent(const LogEntry& shown) : entry(shown) {}
+  explicit LogEvent(const LogEntry& entry);
 
-  std::uint32_t type() const override;
-  OSLogDate date() const override { return OSLogDate(entry.microseconds); }
-  OSLogTimeZone timeZone() const override;
-  std::uint64_t threadIdentifier() const override;
-  std::uint64_t activityIdentifier() const override;
-  std::int32_t processIdentifier() const override;
-  std::string_view process() const override;
-  std::string_view sender() const override;
-  std::string_view subsystem() const override;
-  std::string_view category() const override;
-  std::string_view composedMessage() const override;
+  std::uint32_t type() const override { return kind; }
+  OSLogDate date() const override { return moment; }
+  OSLogTimeZone timeZone() const override { return zone; }
+  std::uint64_t threadIdentifier() const override { return thread; }
+  std::uint64_t activityIdentifier() const override { return activity; }
+  std::int32_t processIdentifier() const override { return pid; }
+  std::string_view process() const override { return text(0); }
+  std::string_view sender() const override { return text(1); }
+  std::string_view subsystem() const override { return text(2); }
+  std::string_view category() const override { return text(3); }
+  std::string_view composedMessage() const override { return text(4); }
 
-  std::string_view senderImagePath() const;
+  /// The bytes of memory that it takes.
+  std::size_t size() const { return sizeof *this + texts.capacity(); }
 
  private:
-  enum class Text : std::uint8_t { process, sender, subsystem, category, message, path, count };
+  static constexpr std::size_t kTexts = 5;
+  std::string_view text(std::size_t index) const {
+    return std::string_view(texts).substr(starts[index], starts[index + 1] - starts[index]);
+  }
 
-  std::string_view processBytes() const;
-  std::string_view pathBytes() const;
-  std::string_view utf8(Text which, std::string_view bytes) const;
-
-  const LogEntry& entry;
-  mutable std::string name;  ///< an unescaped one
-  mutable std::array<std::string, static_cast<std::size_t>(Text::count)> repaired;
+  std::uint64_t thread;
+  std::uint64_t activity;
+  OSLogDate moment;
+  OSLogTimeZone zone;
+  std::uint32_t kind;
+  std::int32_t pid;
+  std::string texts;                                ///< one after the other
+  std::array<std::size_t, kTexts + 1> starts = {};  ///< of each text; the end of the last
 };
+
+/// The name of the process that logged, as UTF-8: _COMM (without journald's escapes, whole by way
+/// of _EXE), SYSLOG_IDENTIFIER.
+std::string processOf(const LogEntry& entry);
+
+/// The path of the image that logged, of any bytes: LOG_SENDER_PATH, _EXE. It is the entry's.
+std::string_view imagePathOf(const LogEntry& entry);
 
 }  // namespace host

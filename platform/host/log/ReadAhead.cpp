@@ -1,6 +1,5 @@
 #include "platform/host/log/ReadAhead.h"
 
-#include <algorithm>
 #include <utility>
 
 namespace host {
@@ -9,16 +8,6 @@ namespace {
 constexpr std::size_t kBatchBytes = std::size_t{256} << 10;
 
 }  // namespace
-
-FinishedEvent::FinishedEvent(const LogEvent& event)
-    : thread(event.threadIdentifier()),
-      activity(event.activityIdentifier()),
-      moment(event.date()),
-      zone(event.timeZone()),
-      kind(event.type()),
-      pid(event.processIdentifier()),
-      texts{event.process(), event.sender(), event.subsystem(), event.category(),
-            event.composedMessage()} {}
 
 ReadAhead::ReadAhead(StopSignal& stop, Open open, Wanted wanted)
     : stopSignal(stop),
@@ -57,28 +46,17 @@ EntryReader::Result ReadAhead::readLog(EntryReader& reader, const Wanted& wanted
   reader.callBeforeWaiting([this] {
     if (!filling.events.empty()) handOver();
   });
-  const LogEvent event(reader.entry());
   EntryReader::Result result = reader.next();
   for (; result == EntryReader::Result::entry; result = reader.next()) {
-    if (wanted(event)) add(event);
+    if (wanted(reader.entry())) add(LogEvent(reader.entry()));
   }
   return result;
 }
 
-void ReadAhead::add(const LogEvent& event) {
-  FinishedEvent finished(event);
-  std::size_t size = 0;
-  for (const std::string_view text : finished.allTexts()) size += text.size();
-  if (filling.bytes.capacity() - filling.bytes.size() < size) {
-    if (!filling.events.empty()) handOver();
-    filling.bytes.reserve(std::max(size, kBatchBytes));
-  }
-  for (std::string_view& text : finished.allTexts()) {
-    const std::size_t start = filling.bytes.size();
-    filling.bytes.insert(filling.bytes.end(), text.begin(), text.end());
-    text = {filling.bytes.data() + start, text.size()};
-  }
-  filling.events.push_back(finished);
+void ReadAhead::add(LogEvent event) {
+  filling.bytes += event.size();
+  filling.events.push_back(std::move(event));
+  if (filling.bytes >= kBatchBytes) handOver();
 }
 
 void ReadAhead::handOver() {
@@ -90,9 +68,7 @@ void ReadAhead::handOver() {
   }
   changed.notify_one();
   filling.events.clear();
-  filling.bytes.clear();
-  // The buffer of a huge event is not kept.
-  if (filling.bytes.capacity() > kBatchBytes) filling.bytes = std::vector<char>();
+  filling.bytes = 0;
 }
 
 void ReadAhead::takeOver() {

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <array>
 #include <condition_variable>
 #include <exception>
 #include <functional>
@@ -15,41 +14,6 @@
 
 namespace host {
 
-/// An event with all its parts decoded, independent of its entry. Its texts belong to whoever made
-/// it.
-///
-/// An event takes three forms: a `LogEntry` is the fields as the reader has them; a `LogEvent` is a
-/// view of one, which decodes a part when it is asked, since a filter asks most entries for one or
-/// two; a `FinishedEvent` is what is handed to another thread.
-class FinishedEvent final : public OSLogEventProxy {
- public:
-  explicit FinishedEvent(const LogEvent& event);
-
-  std::uint32_t type() const override { return kind; }
-  OSLogDate date() const override { return moment; }
-  OSLogTimeZone timeZone() const override { return zone; }
-  std::uint64_t threadIdentifier() const override { return thread; }
-  std::uint64_t activityIdentifier() const override { return activity; }
-  std::int32_t processIdentifier() const override { return pid; }
-  std::string_view process() const override { return texts[0]; }
-  std::string_view sender() const override { return texts[1]; }
-  std::string_view subsystem() const override { return texts[2]; }
-  std::string_view category() const override { return texts[3]; }
-  std::string_view composedMessage() const override { return texts[4]; }
-
-  using Texts = std::array<std::string_view, 5>;
-  Texts& allTexts() { return texts; }
-
- private:
-  std::uint64_t thread;
-  std::uint64_t activity;
-  OSLogDate moment;
-  OSLogTimeZone zone;
-  std::uint32_t kind;
-  std::int32_t pid;
-  Texts texts;
-};
-
 /// Reads a log and decodes its events on a thread of its own, a little ahead of whoever takes
 /// them: to read and to use a log take about as long, and can be done at the same time.
 ///
@@ -63,8 +27,8 @@ class ReadAhead {
   /// Makes the reader of the log. Called on the reading thread, to which the reader belongs.
   using Open = std::function<std::unique_ptr<EntryReader>()>;
 
-  /// Whether an event is to be handed over. Called on the reading thread.
-  using Wanted = std::function<bool(const LogEvent&)>;
+  /// Whether the event of an entry is to be handed over. Called on the reading thread.
+  using Wanted = std::function<bool(const LogEntry&)>;
 
   /// `stop` is what stops the reader, and must outlive this. Throws `std::system_error` when the
   /// system has no thread for it.
@@ -84,8 +48,8 @@ class ReadAhead {
 
  private:
   struct Batch {
-    std::vector<FinishedEvent> events;  ///< their texts lie in `bytes`, which does not grow
-    std::vector<char> bytes;
+    std::vector<LogEvent> events;
+    std::size_t bytes = 0;  ///< of the events
 
     // What follows the events.
     EntryReader::Result after = EntryReader::Result::entry;
@@ -94,7 +58,7 @@ class ReadAhead {
 
   void run(const Open& open, const Wanted& wanted);
   EntryReader::Result readLog(EntryReader& reader, const Wanted& wanted);
-  void add(const LogEvent& event);
+  void add(LogEvent event);
   void handOver();
   void takeOver();
 

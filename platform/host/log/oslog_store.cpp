@@ -10,7 +10,6 @@
 #include "platform/host/device/Device.h"
 #include "platform/host/log/EntryReader.h"
 #include "platform/host/log/EventFilter.h"
-#include "platform/host/log/LogEvent.h"
 #include "platform/host/log/LogSource.h"
 #include "platform/host/log/ReadAhead.h"
 #include "platform/host/log/StopSignal.h"
@@ -39,8 +38,8 @@ unsigned long deliverEvents(const Delivery& delivery) {
   host::ReadAhead reader(
       *delivery.stop,
       [&delivery] { return delivery.source->open(delivery.from, delivery.filter, *delivery.stop); },
-      [&delivery](const host::LogEvent& event) {
-        return event.date() >= delivery.from && delivery.filter.passes(event);
+      [&delivery](const host::LogEntry& entry) {
+        return OSLogDate(entry.microseconds) >= delivery.from && delivery.filter.passes(entry);
       });
   EntryReader::Result result = EntryReader::Result::stopped;
   while (!delivery.stop->raised()) {
