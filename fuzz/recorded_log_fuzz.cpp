@@ -44,7 +44,8 @@ void add(std::string& seen, std::string_view text) {
 }
 
 void addAll(std::string& seen, const host::LogEntry& entry, const host::EventFilter& filter) {
-  const host::LogEvent event(entry);
+  std::string texts;
+  const host::LogEvent event(entry, texts);
   add(seen, event.process());
   add(seen, event.sender());
   add(seen, event.subsystem());

@@ -99,7 +99,8 @@ TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
     const std::string log = kDate + row[0] + '\n';
     RecordedLogReader reader(std::make_unique<Pieces>(log, 1));
     ASSERT_EQ(reader.next(), EntryReader::Result::entry);
-    EXPECT_EQ(summary(host::LogEvent(reader.entry())), row[1]);
+    std::string texts;
+    EXPECT_EQ(summary(host::LogEvent(reader.entry(), texts)), row[1]);
   });
 }
 

@@ -41,27 +41,26 @@ OSLogTimeZone timeZoneOf(const LogEntry& entry) {
 
 }  // namespace
 
-LogEvent::LogEvent(const LogEntry& entry)
+LogEvent::LogEvent(const LogEntry& entry, std::string& storage)
     : thread(number<std::uint64_t>(entry, Field::tid, Field::pid).value_or(0)),
       activity(number<std::uint64_t>(entry, Field::activity).value_or(0)),
       moment(entry.microseconds),
       zone(timeZoneOf(entry)),
       kind(number<std::uint32_t>(entry, Field::type).value_or(kOSLogEventTypeLogMessage)),
-      pid(number<std::int32_t>(entry, Field::pid, Field::syslogPid).value_or(0)) {
+      pid(number<std::int32_t>(entry, Field::pid, Field::syslogPid).value_or(0)),
+      texts(&storage) {
   const std::string process = processOf(entry);
   const std::string_view image = fileName(imagePathOf(entry));
   const std::array<std::string_view, kTexts> parts = {
       process, image.empty() ? process : image,
       firstOf(entry, Field::subsystem, Field::systemdUnit, Field::transport),
       firstOf(entry, Field::category, Field::syslogIdentifier), entry[Field::message]};
-  std::size_t most = 0;
-  for (const std::string_view part : parts) most += part.size();
-  texts.reserve(most);
   std::string repaired;
   for (std::size_t i = 0; i < kTexts; ++i) {
-    texts += posix::asUtf8(parts[i], repaired);
-    starts[i + 1] = texts.size();
+    starts[i] = storage.size();
+    storage += posix::asUtf8(parts[i], repaired);
   }
+  starts[kTexts] = storage.size();
 }
 
 std::string processOf(const LogEntry& entry) {

@@ -12,7 +12,7 @@
 namespace host {
 
 /// The event that an entry of a log stands for, with all its parts decoded. It is independent of
-/// the entry.
+/// the entry; its texts belong to whoever made it.
 ///
 /// Each part comes from a field, or from the next one in its line where the entry has no such
 /// field. A number that cannot be read, and an offset of more than a day, count as no field; a
@@ -27,7 +27,8 @@ namespace host {
 /// - message: MESSAGE
 class LogEvent final : public OSLogEventProxy {
  public:
-  explicit LogEvent(const LogEntry& entry);
+  /// Appends its texts to `storage`, which must outlive it, and may grow but not change.
+  LogEvent(const LogEntry& entry, std::string& storage);
 
   std::uint32_t type() const override { return kind; }
   OSLogDate date() const override { return moment; }
@@ -41,13 +42,11 @@ class LogEvent final : public OSLogEventProxy {
   std::string_view category() const override { return text(3); }
   std::string_view composedMessage() const override { return text(4); }
 
-  /// The bytes of memory that it takes.
-  std::size_t size() const { return sizeof *this + texts.capacity(); }
-
  private:
   static constexpr std::size_t kTexts = 5;
   std::string_view text(std::size_t index) const {
-    return std::string_view(texts).substr(starts[index], starts[index + 1] - starts[index]);
+    const std::size_t start = starts[index];
+    return std::string_view(*texts).substr(start, starts[index + 1] - start);
   }
 
   std::uint64_t thread;
@@ -56,8 +55,8 @@ class LogEvent final : public OSLogEventProxy {
   OSLogTimeZone zone;
   std::uint32_t kind;
   std::int32_t pid;
-  std::string texts;                                ///< one after the other
-  std::array<std::size_t, kTexts + 1> starts = {};  ///< of each text; the end of the last
+  const std::string* texts;
+  std::array<std::size_t, kTexts + 1> starts;  ///< of each text, one after the other, and the end
 };
 
 /// The name of the process that logged, as UTF-8: _COMM (without journald's escapes, whole by way

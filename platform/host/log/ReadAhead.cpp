@@ -24,9 +24,9 @@ ReadAhead::~ReadAhead() {
 }
 
 EntryReader::Result ReadAhead::next() {
-  while (given == taken.events.size()) {
-    if (taken.failure) std::rethrow_exception(taken.failure);
-    if (taken.after != EntryReader::Result::entry) return taken.after;
+  while (given == taken->events.size()) {
+    if (taken->failure) std::rethrow_exception(taken->failure);
+    if (taken->after != EntryReader::Result::entry) return taken->after;
     takeOver();
   }
   ++given;
@@ -35,28 +35,29 @@ EntryReader::Result ReadAhead::next() {
 
 void ReadAhead::run(const Open& open, const Wanted& wanted) {
   try {
-    filling.after = readLog(*open(), wanted);
+    const EntryReader::Result result = readLog(*open(), wanted);
+    filling->after = result;  // the batch that is being filled by now
   } catch (...) {
-    filling.failure = std::current_exception();
+    filling->failure = std::current_exception();
   }
   handOver();
 }
 
 EntryReader::Result ReadAhead::readLog(EntryReader& reader, const Wanted& wanted) {
   reader.callBeforeWaiting([this] {
-    if (!filling.events.empty()) handOver();
+    if (!filling->events.empty()) handOver();
   });
   EntryReader::Result result = reader.next();
   for (; result == EntryReader::Result::entry; result = reader.next()) {
-    if (wanted(reader.entry())) add(LogEvent(reader.entry()));
+    if (wanted(reader.entry())) add(reader.entry());
   }
   return result;
 }
 
-void ReadAhead::add(LogEvent event) {
-  filling.bytes += event.size();
-  filling.events.push_back(std::move(event));
-  if (filling.bytes >= kBatchBytes) handOver();
+void ReadAhead::add(const LogEntry& entry) {
+  filling->events.emplace_back(entry, filling->texts);
+  const std::size_t size = filling->events.size() * sizeof(LogEvent) + filling->texts.size();
+  if (size >= kBatchBytes) handOver();
 }
 
 void ReadAhead::handOver() {
@@ -67,8 +68,10 @@ void ReadAhead::handOver() {
     isReady = true;
   }
   changed.notify_one();
-  filling.events.clear();
-  filling.bytes = 0;
+  filling->events.clear();
+  filling->texts.clear();
+  // What a huge event has taken is not kept.
+  if (filling->texts.capacity() > 2 * kBatchBytes) filling->texts.shrink_to_fit();
 }
 
 void ReadAhead::takeOver() {

@@ -1,10 +1,12 @@
 #pragma once
 
+#include <array>
 #include <condition_variable>
 #include <exception>
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <string>
 #include <thread>
 #include <vector>
 
@@ -44,12 +46,12 @@ class ReadAhead {
   EntryReader::Result next();
 
   /// The event of the last `next`, valid until the next call.
-  const OSLogEventProxy& event() const { return taken.events[given - 1]; }
+  const OSLogEventProxy& event() const { return taken->events[given - 1]; }
 
  private:
   struct Batch {
     std::vector<LogEvent> events;
-    std::size_t bytes = 0;  ///< of the events
+    std::string texts;  ///< of the events
 
     // What follows the events.
     EntryReader::Result after = EntryReader::Result::entry;
@@ -58,17 +60,18 @@ class ReadAhead {
 
   void run(const Open& open, const Wanted& wanted);
   EntryReader::Result readLog(EntryReader& reader, const Wanted& wanted);
-  void add(LogEvent event);
+  void add(const LogEntry& entry);
   void handOver();
   void takeOver();
 
   StopSignal& stopSignal;
-  Batch taken;            ///< the user's
-  std::size_t given = 0;  ///< events of it that have been given
-  Batch filling;          ///< the reading thread's
-  std::mutex mutex;       ///< of what follows
+  std::array<Batch, 3> batches;
+  Batch* taken = &batches[0];    ///< the user's
+  std::size_t given = 0;         ///< events of it that have been given
+  Batch* filling = &batches[1];  ///< the reading thread's
+  std::mutex mutex;              ///< of what follows
   std::condition_variable changed;
-  Batch ready;
+  Batch* ready = &batches[2];
   bool isReady = false;
   bool abandoned = false;
   std::thread thread;
