@@ -88,7 +88,8 @@ std::string summary(const OSLogEventProxy& event) {
   for (const auto part : {event.process(), event.sender(), event.subsystem(), event.category(),
                           event.composedMessage()}) {
     const bool isLong = part.size() > 100;  // and no help to who reads what differs
-    text += '|' + (isLong ? std::to_string(std::hash<std::string_view>()(part)) : std::string(part));
+    text +=
+        '|' + (isLong ? std::to_string(std::hash<std::string_view>()(part)) : std::string(part));
   }
   return text + '@' + std::to_string(event.timeZone().secondsFromGMT(event.date()));
 }
