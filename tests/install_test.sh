@@ -9,6 +9,7 @@ scratch=$(mktemp -d)
 trap 'rm -rf "$scratch"' EXIT
 cd "$scratch"
 umask 022
+export LC_ALL=C.UTF-8  # for paths that are not ASCII
 
 fail() { echo "install_test: $*" >&2; exit 1; }
 

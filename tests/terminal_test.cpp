@@ -292,30 +292,25 @@ class Model {
     return text;
   }
 
-  bool isStart(std::size_t at) const {
-    return at == 0 || at == line.size() ||
-           ((line[at] & 0xC0) != 0x80 && line.compare(at, 2, "\xCC\x81") != 0);
-  }
-
-  /// The next place to the left, or right, that `isThere`, or the end on that side.
+  /// The next place to the left, or right, at which `isThere` finds what is there and before it.
   std::size_t reach(int step, auto isThere) const {
     auto at = cursor;
-    while (at != (step < 0 ? 0 : line.size())) {
+    do {
+      if (at == (step < 0 ? 0 : line.size())) return at;
       at += static_cast<std::size_t>(step);
-      if (isThere(at)) break;
-    }
+    } while (at > 0 && at < line.size() && !isThere(line.substr(at), line[at - 1]));
     return at;
   }
 
   std::size_t next(int step) const {
-    return reach(step, [this](std::size_t at) { return isStart(at); });
+    return reach(step, [](const std::string& rest, char) {
+      return (rest[0] & 0xC0) != 0x80 && !rest.starts_with("\xCC\x81");
+    });
   }
 
   std::size_t nextWord(int step) const {
-    const auto isBlank = [this](std::size_t at) { return line[at] == ' '; };
-    return reach(step, [&](std::size_t at) {
-      return at > 0 && at < line.size() && isBlank(step < 0 ? at - 1 : at) &&
-             !isBlank(step < 0 ? at : at - 1);
+    return reach(step, [step](const std::string& rest, char before) {
+      return rest[0] != before && (step < 0 ? before : rest[0]) == ' ';
     });
   }
 
@@ -407,11 +402,7 @@ TEST(EditedLine, LeavesTheTerminalAsItWasWhateverSignalEndsIt) {
     Typist typist("linux", kUsual);
     for (const int waking : {SIGWINCH, SIGCONT}) kill(typist.process, waking);
     typist.type("x");
-    if (signal != SIGINT) {
-      for (const int sent : {SIGSTOP, signal, SIGCONT}) kill(typist.process, sent);
-    } else {
-      kill(typist.process, signal);
-    }
+    for (const int sent : {SIGSTOP, signal, SIGCONT}) kill(typist.process, sent);
     EXPECT_EQ(typist.ended(), 1000 + signal);
     EXPECT_TRUE(isAsItWas(typist.terminal)) << signal;
   }
