@@ -34,7 +34,7 @@ bool isOneOf(std::string_view keys, const std::string& key) {
 }
 
 bool isText(const std::string& key) {
-  return key.size() == 1 && static_cast<unsigned char>(key[0]) >= ' ';
+  return key.size() == 1 && static_cast<unsigned char>(key[0]) >= ' ' && key[0] != 0x7F;
 }
 
 /// Whether `key`, which starts with an escape, is all that the key sends.
@@ -201,10 +201,10 @@ void Editor::draw() {
 void Editor::press(const std::string& key) {
   hadKilled = std::exchange(hasKilled, false);
   if (followSearch(key)) return;
+  if (isText(key)) return line.insert(key);
   for (const auto& [keys, act] : kBindings) {
     if (isOneOf(keys, key)) return act(*this);
   }
-  if (isText(key)) line.insert(key);
 }
 
 void Editor::accept() {
