@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
-#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -19,20 +18,14 @@ namespace {
 
 using host::EntryReader;
 
-class Pieces final : public host::ByteSource {
- public:
-  Pieces(std::string_view bytes, std::size_t most) : rest(bytes), piece(most) {}
-
-  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
-    const std::size_t count = rest.copy(buffer, std::min(size, piece));
-    rest.remove_prefix(count);
-    return count;
-  }
-
- private:
-  std::string_view rest;
-  std::size_t piece;
-};
+/// Gives the bytes of a log, `most` at a time.
+auto pieces(std::string_view log, std::size_t most) {
+  return [log, most](char* buffer, std::size_t size) mutable {
+    const std::size_t count = log.copy(buffer, std::min(size, most));
+    log.remove_prefix(count);
+    return std::optional(count);
+  };
+}
 
 void require(bool holds) {
   if (!holds) std::abort();
@@ -60,7 +53,7 @@ void addAll(std::string& seen, const host::LogEntry& entry, const host::EventFil
 
 /// All that the log says.
 std::string read(std::string_view log, std::size_t piece, const host::EventFilter& filter) {
-  host::RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
+  host::RecordedLogReader reader(pieces(log, piece));
   std::string seen;
   try {
     while (reader.next() == EntryReader::Result::entry) addAll(seen, reader.entry(), filter);

@@ -47,20 +47,18 @@ std::string binary(const std::string& name, const std::string& value,
   return text + value + '\n';
 }
 
-struct Pieces final : host::ByteSource {
-  Pieces(std::string_view bytes, std::size_t most) : rest(bytes), piece(most) {}
-  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
-    const std::size_t count = rest.copy(buffer, std::min(size, piece));
-    rest.remove_prefix(count);
-    return count;
-  }
-  std::string_view rest;
-  std::size_t piece;
-};
+/// Gives the bytes of a log, `most` at a time.
+auto pieces(std::string_view log, std::size_t most) {
+  return [log, most](char* buffer, std::size_t size) mutable {
+    const std::size_t count = log.copy(buffer, std::min(size, most));
+    log.remove_prefix(count);
+    return std::optional(count);
+  };
+}
 
 /// The messages of a log, and after them how it ends.
 Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
-  RecordedLogReader reader(std::make_unique<Pieces>(log, piece));
+  RecordedLogReader reader(pieces(log, piece));
   Texts seen;
   try {
     while (reader.next() == EntryReader::Result::entry) {
@@ -98,7 +96,7 @@ TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
   moveEast();
   forEachRow("event-fields", 2, [](const Row& row) {
     const std::string log = kDate + row[0] + '\n';
-    RecordedLogReader reader(std::make_unique<Pieces>(log, 1));
+    RecordedLogReader reader(pieces(log, 1));
     ASSERT_EQ(reader.next(), EntryReader::Result::entry);
     std::string texts;
     EXPECT_EQ(summary(host::LogEvent(reader.entry(), texts)), row[1]);

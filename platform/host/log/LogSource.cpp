@@ -1,6 +1,7 @@
 #include "platform/host/log/LogSource.h"
 
 #include <fcntl.h>
+#include <sys/mman.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -21,23 +22,8 @@
 namespace host {
 namespace {
 
-/// The bytes of a text.
-class TextBytes final : public ByteSource {
- public:
-  explicit TextBytes(std::string given) : text(std::move(given)) {}
-
-  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
-    const std::size_t count = text.copy(buffer, size);
-    text.erase(0, count);
-    return count;
-  }
-
- private:
-  std::string text;
-};
-
 /// The bytes that a descriptor gives: of a file, from its start, whoever else reads it.
-class DescriptorBytes final : public ByteSource {
+class DescriptorBytes {
  public:
   /// `name` is for errors.
   DescriptorBytes(std::string name, int opened, const StopSignal& signal)
@@ -46,7 +32,7 @@ class DescriptorBytes final : public ByteSource {
         stop(signal),
         isFile(::lseek(opened, 0, SEEK_CUR) >= 0) {}
 
-  std::optional<std::size_t> read(char* buffer, std::size_t size) override {
+  std::optional<std::size_t> operator()(char* buffer, std::size_t size) {
     while (stop.waitReadable(descriptor)) {
       const ssize_t count =
           isFile ? ::pread(descriptor, buffer, size, offset) : ::read(descriptor, buffer, size);
@@ -69,15 +55,6 @@ class DescriptorBytes final : public ByteSource {
   off_t offset = 0;
 };
 
-class SampleSource final : public LogSource {
- public:
-  std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
-                                    const StopSignal&) const override {
-    return std::make_unique<RecordedLogReader>(
-        std::make_unique<TextBytes>(sampleLog(OSLogDate::now())));
-  }
-};
-
 class RecordedSource final : public LogSource {
  public:
   RecordedSource(std::string name, posix::Descriptor opened)
@@ -85,8 +62,7 @@ class RecordedSource final : public LogSource {
 
   std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
                                     const StopSignal& stop) const override {
-    return std::make_unique<RecordedLogReader>(
-        std::make_unique<DescriptorBytes>(path, descriptor.get(), stop));
+    return std::make_unique<RecordedLogReader>(DescriptorBytes(path, descriptor.get(), stop));
   }
 
  private:
@@ -120,10 +96,21 @@ bool isJournalFile(int descriptor) {
          std::string_view(start.data(), start.size()) == kSignature;
 }
 
+/// A file in memory that holds `text`.
+posix::Descriptor memoryFile(std::string_view text) {
+  posix::Descriptor file(::memfd_create("log", MFD_CLOEXEC));
+  const std::error_code failure =
+      file ? posix::writeAll(file.get(), text) : std::error_code(errno, std::generic_category());
+  if (failure) throw std::system_error(failure, "memfd");
+  return file;
+}
+
 }  // namespace
 
 std::shared_ptr<LogSource> prepareLog(const std::string& log) {
-  if (log == "sample") return std::make_shared<SampleSource>();
+  if (log == "sample") {
+    return std::make_shared<RecordedSource>(log, memoryFile(sampleLog(OSLogDate::now())));
+  }
   if (log == "journal") return std::make_shared<JournalSource>("");
   // Not to wait here for a pipe's writer: that is for the reading, which can be stopped.
   posix::Descriptor opened(::open(log.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));

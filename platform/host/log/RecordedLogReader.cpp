@@ -26,8 +26,8 @@ constexpr std::string_view kSeparatorPrefix = "-- ";
 
 }  // namespace
 
-RecordedLogReader::RecordedLogReader(std::unique_ptr<ByteSource> bytes)
-    : source(std::move(bytes)),
+RecordedLogReader::RecordedLogReader(ReadBytes bytes)
+    : readBytes(std::move(bytes)),
       buffer(kBuffer + 1, '\n'),
       position(buffer.data()),
       limit(position) {}
@@ -194,7 +194,7 @@ bool RecordedLogReader::refill() {
   std::memmove(buffer.data(), position, left);
   position = buffer.data();
   beforeWaiting();
-  const std::optional<std::size_t> count = source->read(buffer.data() + left, kBuffer - left);
+  const std::optional<std::size_t> count = readBytes(buffer.data() + left, kBuffer - left);
   char* const end = buffer.data() + left + count.value_or(0);
   *end = '\n';
   limit = end;

@@ -3,12 +3,12 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
-#include <memory>
+#include <functional>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
-#include "platform/host/log/ByteSource.h"
 #include "platform/host/log/EntryReader.h"
 
 namespace host {
@@ -31,7 +31,12 @@ class RecordedLogReader final : public EntryReader {
   static constexpr std::size_t kBuffer = std::size_t{256} << 10;
   static constexpr std::size_t kMaxName = 255;
 
-  explicit RecordedLogReader(std::unique_ptr<ByteSource> bytes);
+  /// Puts the next bytes of the log, at most `size` (which is not 0), into `buffer`, and returns
+  /// their number: 0 at the end, nothing when the reader has been asked to stop. May block. Throws
+  /// `std::system_error` when the rest cannot be read. Called again only after a number above 0.
+  using ReadBytes = std::function<std::optional<std::size_t>(char* buffer, std::size_t size)>;
+
+  explicit RecordedLogReader(ReadBytes bytes);
 
   Result next() override;
 
@@ -64,7 +69,7 @@ class RecordedLogReader final : public EntryReader {
   std::size_t rest() const { return static_cast<std::size_t>(limit - position); }
   std::string& copy(Field field) { return copies[static_cast<std::size_t>(field)]; }
 
-  const std::unique_ptr<ByteSource> source;
+  const ReadBytes readBytes;
   std::vector<char> buffer;    ///< of kBuffer bytes, and a newline after those that it holds
   const char* position;        ///< of the first byte not yet read, in the buffer
   const char* limit;           ///< the end of what the buffer holds
