@@ -1,6 +1,7 @@
 #include "platform/host/log/JournalFiles.h"
 
 #include <fcntl.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 
 #include <algorithm>
@@ -23,20 +24,17 @@ constexpr const char* kMachineIdFile = "/etc/machine-id";
 constexpr const char* kVolatileFolder = "/run/log/journal";
 constexpr const char* kKeptFolder = "/var/log/journal";
 
-/// The 32 small hexadecimal digits of a machine ID in any of its spellings; empty for other texts.
+/// The 32 small hexadecimal digits of a machine ID, written with dashes or without; empty for other
+/// texts.
 std::string machineId(std::string_view text) {
-  constexpr std::string_view kPlain = "xxxxxxxxxxxxxxxxxxxxxxxxxxxxxxxx";
-  constexpr std::string_view kUuid = "xxxxxxxx-xxxx-xxxx-xxxx-xxxxxxxxxxxx";
-  const std::string_view form = text.size() == kUuid.size() ? kUuid : kPlain;
-  if (text.size() != form.size()) return {};
+  constexpr std::size_t kDigits = 32;
   std::string id;
-  for (std::size_t i = 0; i < form.size(); ++i) {
-    const char letter = posix::lowered(text[i]);
-    const bool isDigit = (letter >= '0' && letter <= '9') || (letter >= 'a' && letter <= 'f');
-    if (form[i] == 'x' ? !isDigit : letter != form[i]) return {};
-    if (isDigit) id += letter;
+  for (const char letter : text) {
+    if (letter != '-') id += posix::lowered(letter);
   }
-  return id;
+  const bool isOne =
+      id.size() == kDigits && id.find_first_not_of("0123456789abcdef") == std::string::npos;
+  return isOne ? id : "";
 }
 
 [[noreturn]] void refuseUnreadable(const fs::path& path, const std::error_code& error) {
@@ -48,15 +46,12 @@ std::string machineId(std::string_view text) {
 }
 
 /// The entries of a folder; none where there is no such folder.
-std::vector<fs::directory_entry> entriesOf(const fs::path& folder) {
-  std::vector<fs::directory_entry> entries;
-  std::error_code error;
-  fs::directory_iterator entry(folder, error);
-  for (; !error && entry != fs::directory_iterator(); entry.increment(error)) {
-    entries.push_back(*entry);
-  }
-  if (error && error != std::errc::no_such_file_or_directory) refuseUnreadable(folder, error);
-  return entries;
+std::vector<fs::directory_entry> entriesOf(const fs::path& folder) try {
+  const fs::directory_iterator first(folder);
+  return {begin(first), end(first)};
+} catch (const fs::filesystem_error& error) {
+  if (error.code() != std::errc::no_such_file_or_directory) refuseUnreadable(folder, error.code());
+  return {};
 }
 
 /// `folder` and those below it that are called by machine IDs, or by `onlyId`.
@@ -115,17 +110,6 @@ std::optional<Identity> identityOf(const fs::path& path) {
 
 using Identities = std::vector<Identity>;
 
-Identities identitiesOf(const std::vector<JournalFile>& files) {
-  Identities identities;
-  for (const JournalFile& file : files) {
-    struct stat about = {};
-    if (::fstat(file.descriptor.get(), &about) == 0)
-      identities.emplace_back(about.st_dev, about.st_ino);
-  }
-  std::ranges::sort(identities);
-  return identities;
-}
-
 Identities identitiesOf(const std::vector<fs::path>& paths) {
   Identities identities;
   for (const fs::path& path : paths) {
@@ -133,6 +117,14 @@ Identities identitiesOf(const std::vector<fs::path>& paths) {
   }
   std::ranges::sort(identities);
   return identities;
+}
+
+/// A journal may have more files than the common soft limit, 1,024, lets a process open.
+void raiseDescriptorLimit() {
+  rlimit limit = {};
+  if (::getrlimit(RLIMIT_NOFILE, &limit) != 0) return;
+  limit.rlim_cur = limit.rlim_max;
+  ::setrlimit(RLIMIT_NOFILE, &limit);
 }
 
 std::vector<JournalFile> openAll(const std::vector<fs::path>& paths) {
@@ -161,8 +153,14 @@ fs::path folderOf(fs::path path) {
 }  // namespace
 
 std::vector<JournalFile> openJournalFiles(const std::string& journal) {
-  std::vector<JournalFile> files = openAll(filesOf(journal));
-  while (identitiesOf(files) != identitiesOf(filesOf(journal))) files = openAll(filesOf(journal));
+  raiseDescriptorLimit();
+  std::vector<JournalFile> files;
+  Identities before;
+  do {
+    const std::vector<fs::path> paths = filesOf(journal);
+    before = identitiesOf(paths);
+    files = openAll(paths);
+  } while (identitiesOf(filesOf(journal)) != before);
   if (!files.empty()) return files;
   if (!journal.empty()) throw std::runtime_error("No journal: no journal files in " + journal);
   throw std::runtime_error(std::string("No journal: no journal files in ") + kKeptFolder + " or " +

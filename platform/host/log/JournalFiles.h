@@ -7,9 +7,9 @@
 #include "platform/posix/Descriptor.h"
 
 /// The files that make up a journal, found as journalctl finds them: those whose names end in
-/// .journal or .journal~, in a folder and in the folders below it whose name is a machine ID (32
-/// hexadecimal digits, or a UUID with its dashes). Folders of journal namespaces are not among
-/// them. Of this machine's journal, /var/log/journal has only the folder of its own ID.
+/// .journal or .journal~, in a folder and in the folders below it whose name is a machine ID: 32
+/// hexadecimal digits, with dashes or without. Folders of journal namespaces are not among them. Of
+/// this machine's journal, /var/log/journal has only the folder of its own ID.
 ///
 /// `journal` is the path of a folder or of one journal file; empty stands for this machine's
 /// journal.
@@ -22,9 +22,10 @@ struct JournalFile {
 };
 
 /// Opens the files of a journal, all as of one moment: none is missed, or opened twice, because
-/// the journal is rotated meanwhile. Throws `std::runtime_error`, whose text says what is wrong and
-/// what can be done, when there is none, or one that may not be read: a smaller journal would be
-/// taken for all of it.
+/// the journal is rotated meanwhile. Raises the process's soft limit of open descriptors to the
+/// hard one, as journalctl does. Throws `std::runtime_error`, whose text says what is wrong and
+/// what can be done, when there is no file, or one that cannot be opened: the others would be taken
+/// for the whole journal.
 std::vector<JournalFile> openJournalFiles(const std::string& journal);
 
 /// Whether the file at `path`, or one that would be made there, is or would be in a folder of the

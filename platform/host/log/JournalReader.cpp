@@ -24,26 +24,31 @@ const Libsystemd& lib() { return Libsystemd::shared(); }
 
 constexpr std::string_view kCannotRead = "Cannot read the journal: ";
 
+/// Thrown for an error of the library. The text says what it means.
+class LibraryError : public std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
+
 /// An error of the library, which has meanings of its own for some numbers.
-std::runtime_error libraryError(int number) {
+LibraryError libraryError(int number) {
   switch (number) {
     case ENODATA:
-      return std::runtime_error("cut off");
+      return LibraryError("cut off");
     case EBADMSG:
-      return std::runtime_error("no journal file, or damaged");
+      return LibraryError("no journal file, or damaged");
     case EIDRM:
-      return std::runtime_error("deleted while it was read");
+      return LibraryError("deleted while it was read");
     case EPROTONOSUPPORT:
-      return std::runtime_error("made by a later version of systemd");
+      return LibraryError("made by a later version of systemd");
     default:
-      return std::runtime_error(std::generic_category().message(number));
+      return LibraryError(std::generic_category().message(number));
   }
 }
 
 /// A journal that the library has open. Threads: all of it belongs to one thread.
 class OpenJournal {
  public:
-  /// Throws `std::runtime_error`.
+  /// Throws `LibraryError`.
   explicit OpenJournal(std::span<const JournalFile> files) {
     std::vector<posix::Descriptor> copies;
     std::vector<int> numbers;
@@ -66,7 +71,7 @@ class OpenJournal {
 
   /// `result`, of a call of the library, unless it is an error, which it throws.
   int check(int result) const {
-    if (faults.any()) throw std::runtime_error("truncated while it was read");
+    if (faults.any()) throw LibraryError("truncated while it was read");
     if (result < 0) throw libraryError(-result);
     return result;
   }
@@ -79,6 +84,15 @@ class OpenJournal {
   JournalFaults faults;
   std::unique_ptr<sd_journal, Close> journal;
 };
+
+/// Throws `std::runtime_error`, whose text has `name`, when the library cannot open `files`.
+void checkOpens(std::span<const JournalFile> files, const std::string& name) try {
+  const OpenJournal journal(files);
+} catch (const LibraryError& error) {
+  throw std::runtime_error(std::string(kCannotRead) + name + error.what());
+}
+
+void checkAlone(const JournalFile& file) { checkOpens({&file, 1}, file.path.string() + ": "); }
 
 /// A field as the library gives it, "NAME=value".
 struct NamedValue {
@@ -103,9 +117,9 @@ constexpr std::size_t kMostOfAValue = kMaxField + 1024;
 
 class JournalReader final : public EntryReader {
  public:
-  JournalReader(std::vector<JournalFile> opened, OSLogDate date, const EventFilter& events,
+  JournalReader(const std::vector<JournalFile>& opened, OSLogDate date, const EventFilter& events,
                 const StopSignal& signal)
-      : files(std::move(opened)), from(date), filter(events), stop(signal), journal(files) {}
+      : files(opened), from(date), filter(events), stop(signal), journal(files) {}
 
   Result next() override try {
     if (!begun) begin();
@@ -119,11 +133,7 @@ class JournalReader final : public EntryReader {
       if (readEntry()) return Result::entry;
     }
     return Result::stopped;
-  } catch (const DamagedLog&) {
-    throw;
-  } catch (const std::bad_alloc&) {
-    throw;
-  } catch (const std::exception& error) {
+  } catch (const LibraryError& error) {
     checkFiles();  // may know which file it is
     throw std::runtime_error(std::string(kCannotRead) + error.what());
   }
@@ -143,7 +153,7 @@ class JournalReader final : public EntryReader {
   void checkFiles() const {
     std::uint64_t present = 0;
     for (const JournalFile& file : files) {
-      checkJournalFile(file);
+      checkAlone(file);
       struct stat about = {};
       ::fstat(file.descriptor.get(), &about);
       present += static_cast<std::uint64_t>(about.st_blocks) * kBlockSize;
@@ -151,7 +161,8 @@ class JournalReader final : public EntryReader {
     std::uint64_t used = 0;
     if (lib().sd_journal_get_usage(journal.get(), &used) < 0 || used < present) {
       throw std::runtime_error(std::string(kCannotRead) +
-                               "files were dropped, for too little memory?");
+                               "a file was overwritten while it was read, or there was too little "
+                               "memory for it");
     }
   }
 
@@ -244,7 +255,7 @@ class JournalReader final : public EntryReader {
     return values;
   }
 
-  const std::vector<JournalFile> files;
+  const std::vector<JournalFile>& files;
   const OSLogDate from;
   const EventFilter& filter;
   const StopSignal& stop;
@@ -258,15 +269,14 @@ class JournalReader final : public EntryReader {
 
 }  // namespace
 
-void checkJournalFile(const JournalFile& file) try {
-  const OpenJournal alone({&file, 1});
-} catch (const std::exception& error) {
-  throw std::runtime_error(std::string(kCannotRead) + file.path.string() + ": " + error.what());
+void checkJournalFiles(const std::vector<JournalFile>& files) {
+  for (const JournalFile& file : files) checkAlone(file);
+  checkOpens(files, "");
 }
 
-std::unique_ptr<EntryReader> readJournal(std::vector<JournalFile> files, OSLogDate from,
+std::unique_ptr<EntryReader> readJournal(const std::vector<JournalFile>& files, OSLogDate from,
                                          const EventFilter& filter, const StopSignal& stop) {
-  return std::make_unique<JournalReader>(std::move(files), from, filter, stop);
+  return std::make_unique<JournalReader>(files, from, filter, stop);
 }
 
 }  // namespace host

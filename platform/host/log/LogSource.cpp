@@ -70,21 +70,21 @@ class RecordedSource final : public LogSource {
   posix::Descriptor descriptor;
 };
 
-/// Opens the files when they are read, as the journal then is.
+/// The files of a journal, as it was when it was prepared.
 class JournalSource final : public LogSource {
  public:
-  /// As `openJournalFiles`. Throws `std::runtime_error` when not all of it can be read.
-  explicit JournalSource(std::string name) : journal(std::move(name)) {
-    for (const JournalFile& file : openJournalFiles(journal)) checkJournalFile(file);
+  /// As `openJournalFiles` and `checkJournalFiles`.
+  explicit JournalSource(const std::string& journal) : files(openJournalFiles(journal)) {
+    checkJournalFiles(files);
   }
 
   std::unique_ptr<EntryReader> open(OSLogDate from, const EventFilter& filter,
                                     const StopSignal& stop) const override {
-    return readJournal(openJournalFiles(journal), from, filter, stop);
+    return readJournal(files, from, filter, stop);
   }
 
  private:
-  std::string journal;
+  std::vector<JournalFile> files;
 };
 
 /// Whether the file is a journal file: what it begins with, see systemd's description of the

@@ -15,10 +15,10 @@ namespace {
 
 }  // namespace
 
-void checkJournalFile(const JournalFile&) { refuse(); }
+void checkJournalFiles(const std::vector<JournalFile>&) { refuse(); }
 
-std::unique_ptr<EntryReader> readJournal(std::vector<JournalFile>, OSLogDate, const EventFilter&,
-                                         const StopSignal&) {
+std::unique_ptr<EntryReader> readJournal(const std::vector<JournalFile>&, OSLogDate,
+                                         const EventFilter&, const StopSignal&) {
   refuse();
 }
 
