@@ -140,8 +140,11 @@ void SetHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& fi
     if (const auto failing = weakStream.lock()) failing->invalidate();
   });
   stream->setInvalidationHandler([group](unsigned long reason, const OSLogEventStreamPosition&) {
-    if (reason != kOSLogEventStreamEndOfLog) {
-      platform::logError("Invalid oslog stream: reason = " + std::to_string(reason));
+    try {
+      if (reason != kOSLogEventStreamEndOfLog) {
+        platform::logError("Invalid oslog stream: reason = " + std::to_string(reason));
+      }
+    } catch (const std::bad_alloc&) {  // it ends all the same
     }
     group.leave();
   });

@@ -14,6 +14,7 @@
 #include <new>
 #include <sstream>
 
+#include "oslog/OsLogStream.h"
 #include "platform/host/device/Device.h"
 #include "platform/host/log/FoldedText.h"
 #include "platform/host/log/LogEvent.h"
@@ -22,6 +23,7 @@
 #include "platform/posix/Descriptor.h"
 #include "platform/posix/Utf8.h"
 #include "platform/system.h"
+#include "tests/FailingAllocations.h"
 #include "tests/Program.h"
 #include "tests/StreamRun.h"
 #include "tests/Table.h"
@@ -207,6 +209,27 @@ class LogStore : public testing::Test {
     return error.value_or("none");
   }
 
+  /// Exports `log`, of `lines` lines, with each allocation failing in turn.
+  void starve(const std::string& log, std::ptrdiff_t lines) const {
+    host::device().log = log;
+    const std::string file = scratch.path("export");
+    bool failed = true;
+    for (int nth = 1; failed; ++nth) {
+      bool succeeded = false;
+      {
+        const FailingAllocation failing(nth);
+        try {
+          succeeded = OsLogStream::putOsLogStreamToFile(file, {"nobody"}, {"/É"}, 4e9);
+        } catch (const std::bad_alloc&) {
+          succeeded = false;
+        }
+        failed = FailingAllocation::hasFailed();
+      }
+      EXPECT_TRUE(failed || succeeded);
+      EXPECT_TRUE(failed || std::ranges::count(readFile(file), '\n') == lines);
+    }
+  }
+
   static std::ptrdiff_t openDescriptors() {
     return std::ranges::distance(std::filesystem::directory_iterator("/proc/self/fd"));
   }
@@ -310,6 +333,13 @@ TEST_F(LogStore, HoldsTextsOfAnySizeAsLongAsTheyAreInHand) {
   EXPECT_EQ(seen, 40U);
   EXPECT_LT(held, kHuge / 2);
   EXPECT_EQ(run(stream(log), 1).reason, kInvalidated) << "while it reads ahead";
+}
+
+TEST_F(LogStore, OutlivesEachAllocationOfAnExportThatFails) {
+  const std::string fields = "_COMM=a-long-process-\n_EXE=/É/a-long-process-name\nMESSAGE=";
+  const std::string message = std::string(300'000, 'm') + "\xFF and no more";
+  const std::string damaged = "the end, which is reported";
+  starve(write("log", kDate + fields + message + "\n\n" + damaged), 1);
 }
 
 TEST_F(LogStore, NothingThatIsReadIsAnOutput) {
@@ -427,7 +457,9 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
 }
 
 TEST_F(Journal, RefusesAFileThatItCannotRead) {
-  const std::string file = makeFile("x", logOf(10));
+  const std::string file =
+      makeFile("x", kDate + "_BOOT_ID=0123456789abcdef0123456789abcdef\n_EXE=/É/x\nMESSAGE=m\n\n");
+  starve(file, 1);
   for (const auto& [text, why] : {std::pair(std::string(), "cut off"),
                                   {std::string(1000, 'x'), "no journal file, or damaged"}}) {
     write("y.journal", text);

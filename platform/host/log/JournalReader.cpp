@@ -51,6 +51,7 @@ class OpenJournal {
   /// Throws `LibraryError`.
   explicit OpenJournal(std::span<const JournalFile> files) {
     std::vector<posix::Descriptor> copies;
+    copies.reserve(files.size());
     std::vector<int> numbers;
     for (const JournalFile& file : files) {
       copies.emplace_back(::fcntl(file.descriptor.get(), F_DUPFD_CLOEXEC, 0));

@@ -112,11 +112,12 @@ class HostStream final : public OSLogEventStream {
     if (delivery.source == nullptr) return;  // activated before
     delivery.from = date;
     // Shared, so that it is still there when no thread can be had.
-    const auto handed = std::make_shared<Delivery>(std::exchange(delivery, Delivery()));
+    const auto handed = std::make_shared<Delivery>();
+    std::swap(*handed, delivery);
     const posix::SignalsBlocked onTheThread;
     try {
       std::thread([handed] { run(std::move(*handed)); }).detach();
-    } catch (const std::system_error& failure) {
+    } catch (const std::exception& failure) {
       report(failure.what());
       end(std::move(*handed), host::kStreamUnreadable);
     }
