@@ -16,8 +16,6 @@
 
 namespace {
 
-using host::EntryReader;
-
 /// Gives the bytes of a log, `most` at a time.
 auto pieces(std::string_view log, std::size_t most) {
   return [log, most](char* buffer, std::size_t size) mutable {
@@ -56,7 +54,7 @@ std::string read(std::string_view log, std::size_t piece, const host::EventFilte
   host::RecordedLogReader reader(pieces(log, piece));
   std::string seen;
   try {
-    while (reader.next() == EntryReader::Result::entry) addAll(seen, reader.entry(), filter);
+    while (reader.next()) addAll(seen, reader.entry(), filter);
   } catch (const host::DamagedLog& damage) {
     seen += damage.what();
   }

@@ -30,7 +30,6 @@
 
 using namespace std::chrono_literals;
 using namespace std::string_literals;
-using host::EntryReader;
 using host::RecordedLogReader;
 using Texts = std::vector<std::string>;
 
@@ -63,7 +62,7 @@ Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
   RecordedLogReader reader(pieces(log, piece));
   Texts seen;
   try {
-    while (reader.next() == EntryReader::Result::entry) {
+    while (reader.next()) {
       seen.emplace_back(reader.entry()[host::Field::message]);
     }
     seen.emplace_back("end");
@@ -99,7 +98,7 @@ TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
   forEachRow("event-fields", 2, [](const Row& row) {
     const std::string log = kDate + row[0] + '\n';
     RecordedLogReader reader(pieces(log, 1));
-    ASSERT_EQ(reader.next(), EntryReader::Result::entry);
+    ASSERT_TRUE(reader.next());
     std::string texts;
     EXPECT_EQ(summary(host::LogEvent(reader.entry(), texts)), row[1]);
   });

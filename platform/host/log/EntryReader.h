@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cstdint>
 #include <functional>
 #include <stdexcept>
 #include <utility>
@@ -20,17 +19,15 @@ class DamagedLog : public std::runtime_error {
 /// Threads: all of it, making and destroying included, belongs to one thread.
 class EntryReader {
  public:
-  enum class Result : std::uint8_t { entry, end, stopped };
-
   EntryReader() = default;
   EntryReader(const EntryReader&) = delete;
   EntryReader& operator=(const EntryReader&) = delete;
   virtual ~EntryReader() = default;
 
-  /// Reads on to the next entry; `stopped` when the reader has been asked to stop. May block.
-  /// Throws `DamagedLog`; another exception, with the reason as its text, when the rest of the log
-  /// cannot be read. Only after an entry may it be called again.
-  virtual Result next() = 0;
+  /// Reads on to the next entry. False at the end of the log, and when the reader has been asked to
+  /// stop. May block. Throws `DamagedLog`; another exception, with the reason as its text, when the
+  /// rest of the log cannot be read. Called again only after an entry.
+  virtual bool next() = 0;
 
   /// The entry of the last `next`, always the same object. Its values are valid until the next
   /// call.

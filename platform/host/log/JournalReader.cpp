@@ -122,18 +122,18 @@ class JournalReader final : public EntryReader {
                 const StopSignal& signal)
       : files(opened), from(date), filter(events), stop(signal), journal(files) {}
 
-  Result next() override try {
+  bool next() override try {
     if (!begun) begin();
     while (!stop.raised()) {
       constexpr unsigned kEntriesAtATime = 256;
       if (entries++ % kEntriesAtATime == 0) beforeWaiting();
       if (!mayHaveMore || journal.check(lib().sd_journal_next(journal.get())) == 0) {
         checkFiles();
-        return Result::end;
+        return false;
       }
-      if (readEntry()) return Result::entry;
+      if (readEntry()) return true;
     }
-    return Result::stopped;
+    return false;
   } catch (const LibraryError& error) {
     checkFiles();  // may know which file it is
     throw std::runtime_error(std::string(kCannotRead) + error.what());

@@ -23,35 +23,33 @@ ReadAhead::~ReadAhead() {
   thread.join();
 }
 
-EntryReader::Result ReadAhead::next() {
+bool ReadAhead::next() {
   while (given == taken->events.size()) {
     if (taken->failure) std::rethrow_exception(taken->failure);
-    if (taken->after != EntryReader::Result::entry) return taken->after;
+    if (taken->last) return false;
     takeOver();
   }
   ++given;
-  return EntryReader::Result::entry;
+  return true;
 }
 
 void ReadAhead::run(const Open& open, const Wanted& wanted) {
   try {
-    const EntryReader::Result result = readLog(*open(), wanted);
-    filling->after = result;  // the batch that is being filled by now
+    readLog(*open(), wanted);
   } catch (...) {
     filling->failure = std::current_exception();
   }
+  filling->last = true;
   handOver();
 }
 
-EntryReader::Result ReadAhead::readLog(EntryReader& reader, const Wanted& wanted) {
+void ReadAhead::readLog(EntryReader& reader, const Wanted& wanted) {
   reader.callBeforeWaiting([this] {
     if (!filling->events.empty()) handOver();
   });
-  EntryReader::Result result = reader.next();
-  for (; result == EntryReader::Result::entry; result = reader.next()) {
+  while (reader.next()) {
     if (wanted(reader.entry())) add(reader.entry());
   }
-  return result;
 }
 
 void ReadAhead::add(const LogEntry& entry) {

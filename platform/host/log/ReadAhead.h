@@ -43,7 +43,7 @@ class ReadAhead {
 
   /// Goes on to the next event that is wanted. As `EntryReader::next`, with what it, `Open` or
   /// `Wanted` throws.
-  EntryReader::Result next();
+  bool next();
 
   /// The event of the last `next`, valid until the next call.
   const OSLogEventProxy& event() const { return taken->events[given - 1]; }
@@ -53,13 +53,12 @@ class ReadAhead {
     std::vector<LogEvent> events;
     std::string texts;  ///< of the events
 
-    // What follows the events.
-    EntryReader::Result after = EntryReader::Result::entry;
+    bool last = false;  ///< no other follows: the log has ended, or failed, or was stopped
     std::exception_ptr failure;
   };
 
   void run(const Open& open, const Wanted& wanted);
-  EntryReader::Result readLog(EntryReader& reader, const Wanted& wanted);
+  void readLog(EntryReader& reader, const Wanted& wanted);
   void add(const LogEntry& entry);
   void handOver();
   void takeOver();

@@ -36,12 +36,12 @@ const char* RecordedLogReader::endOfLine() const {
   return static_cast<const char*>(std::memchr(position, '\n', rest() + 1));
 }
 
-EntryReader::Result RecordedLogReader::next() {
+bool RecordedLogReader::next() {
   do {
     startEntry();
-    if (outcome != Result::entry || !readEntry()) return outcome;
+    if (!readEntry()) return false;
   } while (!readDate());
-  return Result::entry;
+  return true;
 }
 
 void RecordedLogReader::startEntry() {
@@ -200,7 +200,6 @@ bool RecordedLogReader::refill() {
   limit = end;
   if (count.value_or(0) > 0) return true;
   if (count && (begun || left > 0)) damagedBy("cut off in an entry");
-  outcome = count ? Result::end : Result::stopped;
   return false;
 }
 

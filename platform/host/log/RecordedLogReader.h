@@ -38,14 +38,14 @@ class RecordedLogReader final : public EntryReader {
 
   explicit RecordedLogReader(ReadBytes bytes);
 
-  Result next() override;
+  bool next() override;
 
  private:
   void startEntry();
   bool readEntry();
   bool readDate();
 
-  // Each of these is false when nothing more is to be read, with `outcome` set. `field` is none
+  // Each of these is false when nothing more is to be read. `field` is none
   // where the value is not wanted; `lineEnd` is `limit` where the line continues after it.
   bool readField();
   bool skipSeparator(const char* lineEnd);
@@ -80,8 +80,6 @@ class RecordedLogReader final : public EntryReader {
   std::size_t pieces = 0;  ///< bytes taken of the current field
   std::size_t kept = 0;    ///< bytes of the wanted fields of the current entry
   std::array<std::string, static_cast<std::size_t>(Field::none)> copies;
-
-  Result outcome = Result::entry;
 };
 
 }  // namespace host

@@ -19,8 +19,6 @@
 
 namespace {
 
-using host::EntryReader;
-
 /// All that a stream's thread works with.
 struct Delivery {
   std::shared_ptr<host::LogSource> source;
@@ -41,10 +39,7 @@ unsigned long deliverEvents(const Delivery& delivery) {
       [&delivery](const host::LogEntry& entry) {
         return OSLogDate(entry.microseconds) >= delivery.from && delivery.filter.passes(entry);
       });
-  EntryReader::Result result = EntryReader::Result::stopped;
-  while (!delivery.stop->raised()) {
-    result = reader.next();
-    if (result != EntryReader::Result::entry) break;
+  while (!delivery.stop->raised() && reader.next()) {
     if (delivery.eventHandler) delivery.eventHandler(reader.event());
   }
   if (delivery.stop->raised()) return host::kStreamInvalidated;
