@@ -33,8 +33,7 @@ class EntryReader {
   /// call.
   const LogEntry& entry() const { return current; }
 
-  /// Has `call` called within `next` each time before it may block, and now and then where there
-  /// are many entries: what has been made of those before need not wait for the next one.
+  /// Sets what `next` calls each time before it may block, and now and then between entries.
   void callBeforeWaiting(std::function<void()> call) { beforeWaiting = std::move(call); }
 
  protected:

@@ -11,7 +11,7 @@ namespace host {
 /// It covers ASCII and the Latin letters of U+00C0 to U+024F and U+1E00 to U+1EFF, with those that
 /// are the other case of one of these. A letter with an accent, a stroke, a hook or a tail has a
 /// base letter; a ligature or a digraph, such as U+00C6 or U+01C4, loses only its case and
-/// accents. All else stands as it is. Ill-formed UTF-8 counts as U+FFFD.
+/// accents. All other text is unchanged. Ill-formed UTF-8 counts as U+FFFD.
 ///
 /// Threads: any, after it has been made.
 class FoldedText {

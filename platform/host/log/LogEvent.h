@@ -14,9 +14,9 @@ namespace host {
 /// The event that an entry of a log stands for, with all its parts decoded. It is independent of
 /// the entry; its texts belong to whoever made it.
 ///
-/// Each part comes from a field, or from the next one in its line where the entry has no such
-/// field. A number that cannot be read, and an offset of more than a day, count as no field; a
-/// field that is there counts even when it is empty.
+/// Each part comes from the first field in its line that the entry has, empty or not; a value
+/// without a name is the default. A number that cannot be read, and an offset of more than a day,
+/// count as no field.
 ///
 /// - type: LOG_TYPE, 1024
 /// - date: the entry's; time zone: LOG_GMTOFF (seconds), this machine's local zone

@@ -10,13 +10,13 @@
 
 namespace host {
 
-/// A log that is there to be read. Threads: any.
+/// A log that has been prepared. Threads: any.
 class LogSource : public OSLogEventSource {
  public:
-  /// A reader of the log, from its start or from somewhere before `from`; entries that `filter`
-  /// does not let pass may be left out. It is stopped by `stop`, which must outlive it as the
-  /// filter must, and belongs to the thread that makes it. Throws `std::exception`, whose text
-  /// says why, when the reading cannot be begun.
+  /// Returns a reader of the log, from its start or from a point before `from`. It may leave out
+  /// entries that `filter` does not let pass. `stop` stops it. This source, `filter` and `stop`
+  /// must outlive it, and it belongs to the calling thread. Throws an exception whose text is the
+  /// reason when the log cannot be read.
   virtual std::unique_ptr<EntryReader> open(OSLogDate from, const EventFilter& filter,
                                             const StopSignal& stop) const = 0;
 };

@@ -16,9 +16,9 @@ class StopSignal {
   void raise() noexcept;
   bool raised() const noexcept { return isRaised.load(std::memory_order_relaxed); }
 
-  /// Blocks until `descriptor` has something to read, or has ended or failed, or a signal of the
-  /// system comes; false when this signal is raised, before that or with it. -1 is a descriptor of
-  /// which nothing ever comes.
+  /// Waits until `descriptor` is readable, at its end or in error, or a system signal interrupts
+  /// the wait. Returns false when this signal has been raised. With -1 it waits for this signal
+  /// alone.
   bool waitReadable(int descriptor) const;
 
  private:
