@@ -19,9 +19,9 @@ namespace host {
 /// Reads a log and decodes its events on a thread of its own, a little ahead of the thread that
 /// takes them: the two take about as long.
 ///
-/// Events are handed over in batches. The events at hand are handed over before the reader waits for
-/// more of the log, so that no event waits for a later one. There are three batches, so the thread
-/// is at most two ahead.
+/// Events are handed over in batches. The events at hand are handed over before the reader waits
+/// for more of the log, so that no event waits for a later one. There are three batches, so the
+/// thread is at most two ahead.
 ///
 /// Threads: all members belong to one thread.
 class ReadAhead {
