@@ -99,8 +99,11 @@ class WorkLine {
     if (!gMayShow || !host::hasTerminal(STDOUT_FILENO)) return;
     if (wasLineTyped()) return clear();
     const auto time = std::chrono::floor<std::chrono::seconds>(steady_clock::now() - begin);
-    const auto text = "running " + describe(time, posix::linesWritten() - linesBefore);
-    print("\r" + text.substr(0, host::sizeOfTerminal().columns - 1) + "\033[K");
+    std::string text = "\rrunning ";
+    text += describe(time, posix::linesWritten() - linesBefore);
+    text.resize(std::min(text.size(), host::sizeOfTerminal().columns));
+    text += "\033[K";
+    print(text);
     gIsShown = true;
   }
 
