@@ -22,7 +22,6 @@
 namespace {
 
 const std::string kPrompt = "(/zubtool)>> ";
-const std::string kAtTheEnd = "(/zubtool)>>";
 const std::string kTel = "logdump tel ";
 const std::string kPath = "/private/var/wireless/Library/Logs/CrashVault/Baseband/log-bb-T.tar.gz";
 
@@ -65,12 +64,11 @@ std::string shown(const std::string& bytes, std::size_t columns = 80) {
 
 /// Whether the settings of a terminal are those it had before the program began.
 bool isAsItWas(int terminal) {
-  const auto settingsOf = [](const termios& one) {
-    return std::tuple(one.c_iflag, one.c_oflag, one.c_lflag, one.c_cc[VMIN], one.c_cc[VTIME]);
-  };
   termios now{};
   tcgetattr(terminal, &now);
-  return settingsOf(now) == settingsOf(Program::terminalBefore());
+  const auto before = Program::terminalBefore();
+  return now.c_iflag == before.c_iflag && now.c_oflag == before.c_oflag &&
+         now.c_lflag == before.c_lflag && std::ranges::equal(now.c_cc, before.c_cc);
 }
 
 /// A person who types at a terminal on which a process reads lines, and does nothing else.
@@ -411,27 +409,18 @@ TEST(EditedLine, LeavesTheTerminalAsItWasWhateverSignalEndsIt) {
 /// The program at its prompt, where lines are edited.
 class Terminal : public testing::Test {
  protected:
-  void SetUp() override { start("xterm-256color"); }
-
-  void start(const std::string& term, const std::string& shell = "", int delay = 50) {
-    program.emplace(Start{.profile = "dump-timestamp = T\ndump-delay = " + std::to_string(delay),
-                          .onTerminal = true,
-                          .term = term,
-                          .shell = shell});
-    printed.clear();
+  void start(const std::string& term, const std::string& delay, const std::string& shell = "") {
+    const auto profile = "dump-timestamp = T\ndump-delay = " + delay;
+    program.emplace(Start{.profile = profile, .onTerminal = true, .term = term, .shell = shell});
     read(kPrompt);
   }
 
-  /// Reads what is printed up to and with `end`, `times` times.
-  void read(const std::string& end, int times = 1) {
-    for (; times > 0; --times) printed += program->readUntil(end);
-  }
+  void read(const std::string& end) { printed += program->readUntil(end); }
 
-  /// Ends the input, of which nothing may show.
-  void expectEnd() {
+  void expectEnd(const std::string& out, int status) {
     const auto outcome = program->finish();
-    EXPECT_EQ(outcome.out, "\033[?2004l");
-    EXPECT_EQ(outcome.status, 1);
+    EXPECT_EQ(outcome.out, out);
+    EXPECT_EQ(outcome.status, status);
   }
 
   std::optional<Program> program;
@@ -439,29 +428,28 @@ class Terminal : public testing::Test {
 };
 
 TEST_F(Terminal, IsAsItWasWhileACommandRuns) {
-  start("linux", "", 1'500);  // milliseconds, in which it says that it runs
+  start("linux", "1500");  // milliseconds, in which it says that it runs
   program->type(kTel + "a\r");
   read("running 0:01");
   EXPECT_TRUE(isAsItWas(program->terminal()));
   program->type(kTel + "b\r\004");  // which is kept for the prompts
-  read(kPrompt, 2);
-  EXPECT_EQ(shown(printed), shownFor(kTel + "a") + shownFor(kTel + "b") + kAtTheEnd);
-  expectEnd();
+  read(kPrompt);
+  read(kPrompt);
+  EXPECT_EQ(shown(printed), shownFor(kTel + "a") + shownFor(kTel + "b") + "(/zubtool)>>");
+  expectEnd("\033[?2004l", 1);
 }
 
 TEST_F(Terminal, ShowsNothingOfWorkThatASignalEnds) {
-  start("vt100", "", 60'000);
+  start("vt100", "60000");
   program->type(kTel + "a\r");
   read("running 0:01\033[K");
   kill(program->pid(), SIGTERM);
-  const auto outcome = program->finish();
-  EXPECT_EQ(outcome.out, "\r\033[K");
-  EXPECT_EQ(outcome.status, 1000 + SIGTERM);
+  expectEnd("\r\033[K", 1000 + SIGTERM);
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
   const auto line = kTel + std::string(100, 'r') + 'z';
-  start("xterm-256color", R"("$@"; echo; echo stopped; read -r line; fg >/dev/null)");
+  start("xterm-256color", "0", R"("$@"; echo; echo stopped; read -r line; fg >/dev/null)");
   program->type(line);
   read("rz");
   program->type("\032");
@@ -472,15 +460,15 @@ TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {
   program->type("b\r");
   read(kPath);  // likewise
   read(kPrompt);
-  EXPECT_EQ(shown(printed), kPrompt + line + "\nstopped\n" + shownFor(line + 'b') + kAtTheEnd);
+  EXPECT_EQ(shown(printed), kPrompt + line + "\nstopped\n" + shownFor(line + 'b') + "(/zubtool)>>");
 }
 
 TEST_F(Terminal, IsReadAsBeforeWhereItsCursorDoesNotMove) {
   for (const std::string term : {"dumb", ""}) {
-    start(term);
+    start(term, "0");
     EXPECT_TRUE(isAsItWas(program->terminal())) << term;
     program->type("quit\n");
-    EXPECT_EQ(program->finish().out, "") << term;
+    expectEnd("", 0);
   }
 }
 
