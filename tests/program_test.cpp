@@ -65,7 +65,7 @@ TEST(Program, ReportsErrorsToTheSystemLog) {
   folder.path("log").copy(address.sun_path, sizeof address.sun_path - 1);
   const int log = socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0);
   ASSERT_EQ(bind(log, reinterpret_cast<const sockaddr*>(&address), sizeof address), 0);
-  run({.input = std::string("logdump oslog 600 no\0/such\nquit\n", 33),
+  run({.input = std::string("logdump oslog 600 no\0/such\nquit\n", 32),
        .shell = hideDevices + "ln -s " + folder.path("log") + " /dev/log && \"$@\"' sh \"$@\""});
   char text[100] = {};
   recv(log, text, sizeof text - 1, MSG_DONTWAIT);

@@ -29,19 +29,19 @@ class LibraryError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
-/// An error of the library, which has meanings of its own for some numbers.
-LibraryError libraryError(int number) {
+/// What an error of the library means, which has meanings of its own for some numbers.
+std::string textOf(int number) {
   switch (number) {
     case ENODATA:
-      return LibraryError("cut off");
+      return "cut off";
     case EBADMSG:
-      return LibraryError("no journal file, or damaged");
+      return "no journal file, or damaged";
     case EIDRM:
-      return LibraryError("deleted while it was read");
+      return "deleted while it was read";
     case EPROTONOSUPPORT:
-      return LibraryError("made by a later version of systemd");
+      return "made by a later version of systemd";
     default:
-      return LibraryError(std::generic_category().message(number));
+      return std::generic_category().message(number);
   }
 }
 
@@ -55,7 +55,7 @@ class OpenJournal {
     std::vector<int> numbers;
     for (const JournalFile& file : files) {
       copies.emplace_back(::fcntl(file.descriptor.get(), F_DUPFD_CLOEXEC, 0));
-      if (!copies.back()) throw libraryError(errno);
+      if (!copies.back()) throw LibraryError(textOf(errno));
       numbers.push_back(copies.back().get());
     }
     sd_journal* opened = nullptr;
@@ -73,7 +73,7 @@ class OpenJournal {
   /// `result`, of a call of the library, unless it is an error, which it throws.
   int check(int result) const {
     if (faults.any()) throw LibraryError("truncated while it was read");
-    if (result < 0) throw libraryError(-result);
+    if (result < 0) throw LibraryError(textOf(-result));
     return result;
   }
 

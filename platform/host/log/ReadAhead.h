@@ -65,10 +65,10 @@ class ReadAhead {
 
   StopSignal& stopSignal;
   std::array<Batch, 3> batches;
-  Batch* taken = &batches[0];    ///< the user's
-  std::size_t given = 0;         ///< events of it that have been given
-  Batch* filling = &batches[1];  ///< the reading thread's
-  std::mutex mutex;              ///< of what follows
+  Batch* taken = batches.data();  ///< the user's
+  std::size_t given = 0;          ///< events of it that have been given
+  Batch* filling = &batches[1];   ///< the reading thread's
+  std::mutex mutex;               ///< of what follows
   std::condition_variable changed;
   Batch* ready = &batches[2];
   bool isReady = false;
