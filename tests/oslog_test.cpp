@@ -60,100 +60,86 @@ struct Event final : OSLogEventProxy, Fields {
   }
 };
 
-/// What the store does in a test, and what it was asked.
-struct Script {
-  enum class Prepare { succeeds, fails, comesLate };
-  Prepare prepare = Prepare::succeeds;
+/// The log store and its streams, which do what a test says and note what they are asked.
+class OsLogStreamTest : public testing::Test, public OSLogEventStore, public OSLogEventStream {
+ public:
+  OsLogStreamTest() { current = this; }
+  ~OsLogStreamTest() override {
+    stopped = true;
+    if (thread.joinable()) thread.join();
+  }
+
+  void prepareWithCompletionHandler(PrepareHandler handler) override {
+    calls += "prepare file:" + readFile(folder.path("out")) + "\n";
+    prepare(handler);
+  }
+  void setFlags(std::uint64_t flags) override {
+    calls += "flags " + std::to_string(flags) + " file:" + readFile(folder.path("out")) + "\n";
+  }
+  void setFilterPredicate(OSLogOrPredicate predicate) override {
+    calls += "filter ";
+    for (const auto& [format, value] : predicate.terms) calls.append(format + " " + value + "; ");
+    calls += "\n";
+  }
+  void setEventHandler(EventHandler handler) override {
+    calls += "event handler\n";
+    onEvent = std::move(handler);
+  }
+  void setInvalidationHandler(InvalidationHandler handler) override {
+    calls += "invalidation handler\n";
+    onEnd = std::move(handler);
+  }
+  void activateStreamFromDate(OSLogDate date) override {
+    calls += "activate\n";
+    start = date;
+    thread = std::thread([this, deliver = std::move(onEvent), end = std::move(onEnd)] {
+      for (const auto& event : events) deliver(Event(event));
+      for (; deliversOn && !stopped; ++delivered) deliver(Event({}));
+      end(invalidated ? 1 : reason, {});
+    });
+    awaited();
+  }
+  void invalidate() override { invalidated = true; }
+
+  void logError(const std::string& message) {
+    const std::lock_guard lock(mutex);
+    (message.starts_with("Getting ") ? calls : errors) += message + "\n";
+  }
+
+  static OsLogStreamTest* current;
+
+ protected:
+  bool put(std::chrono::nanoseconds timeout = 60s) {
+    return OsLogStreamClock::put(timeout, output);
+  }
+
+  ScratchFolder folder;
+  std::string output = folder.path("out");
+  const std::string line = "1970-01-01 00:00:00 +0000 0x00000 0x0 0 proc(image):sub.sys [cat] m\n";
+
+  std::function<void(const PrepareHandler&)> prepare = [](const auto& handler) {
+    handler(std::make_shared<OSLogEventSource>(), std::nullopt);
+  };
   std::vector<Fields> events = {{}};
   unsigned long reason = 5;
-  bool deliversOn = false;  ///< goes on with the last event until `stopped`, invalidated or not
+  bool deliversOn = false;  ///< goes on with another event until `stopped`, invalidated or not
   std::function<void()> awaited = [] {};  ///< returns when what the test needs has been delivered
-  std::string watched;                    ///< a file whose content is noted along with some calls
   std::atomic<bool> invalidated = false;
   std::atomic<bool> stopped = false;
   std::atomic<int> delivered = 0;
   std::thread thread;
   OSLogDate start{0};
 
-  std::vector<std::string> calls;
-  std::mutex mutex;
-  std::vector<std::string> errors;  ///< what stands in the system log, but for the start of each
-};
-
-Script* script = nullptr;
-
-class ScriptedStream : public OSLogEventStream {
- public:
-  void setFlags(std::uint64_t flags) override {
-    script->calls.push_back("flags " + std::to_string(flags) +
-                            " file:" + readFile(script->watched));
-  }
-  void setFilterPredicate(OSLogOrPredicate predicate) override {
-    std::string filter = "filter ";
-    for (const auto& [format, value] : predicate.terms) filter += format + " " + value + "; ";
-    script->calls.push_back(filter);
-  }
-  void setEventHandler(EventHandler handler) override {
-    script->calls.push_back("event handler");
-    onEvent = std::move(handler);
-  }
-  void setInvalidationHandler(InvalidationHandler handler) override {
-    script->calls.push_back("invalidation handler");
-    onEnd = std::move(handler);
-  }
-  void activateStreamFromDate(OSLogDate date) override {
-    script->calls.push_back("activate");
-    script->start = date;
-    script->thread = std::thread([deliver = onEvent, end = onEnd] {
-      for (const auto& event : script->events) deliver(Event(event));
-      for (; script->deliversOn && !script->stopped; ++script->delivered) deliver(Event({}));
-      end(script->invalidated ? 1 : script->reason, {});
-    });
-    script->awaited();
-  }
-  void invalidate() override { script->invalidated = true; }
+  std::string calls;
+  std::string errors;  ///< what stands in the system log, but for the start of each stream
 
  private:
+  std::mutex mutex;
   EventHandler onEvent;
   InvalidationHandler onEnd;
 };
 
-class ScriptedStore : public OSLogEventStore {
-  void prepareWithCompletionHandler(PrepareHandler handler) override {
-    script->calls.push_back("prepare file:" + readFile(script->watched));
-    const auto succeed = [handler] { handler(std::make_shared<OSLogEventSource>(), std::nullopt); };
-    if (script->prepare == Script::Prepare::comesLate) {
-      script->thread = std::thread([succeed] {  // which learns of nothing else that was done
-        while (!script->stopped.load(std::memory_order_relaxed)) std::this_thread::yield();
-        succeed();
-      });
-    }
-    if (script->prepare == Script::Prepare::fails) handler(nullptr, "locked");
-    if (script->prepare == Script::Prepare::succeeds) succeed();
-  }
-};
-
-class OsLogStreamTest : public ::testing::Test, public Script {
- protected:
-  OsLogStreamTest() {
-    script = this;
-    watched = output = folder.path("out");
-  }
-  ~OsLogStreamTest() override {
-    stopped = true;
-    if (thread.joinable()) thread.join();
-  }
-
-  bool put(std::chrono::nanoseconds timeout = 60s) {
-    return OsLogStreamClock::put(timeout, output);
-  }
-
-  ScratchFolder folder;
-  std::string output;
-  const std::string line = "1970-01-01 00:00:00 +0000 0x00000 0x0 0 proc(image):sub.sys [cat] m\n";
-};
-
-using Texts = std::vector<std::string>;
+OsLogStreamTest* OsLogStreamTest::current = nullptr;
 
 TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
   writeFile(output, "old");
@@ -161,10 +147,10 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
   const auto before = OSLogDate::now();
   EXPECT_TRUE(OsLogStream::putOsLogStreamToFile(output, {"p1", "p2"}, {"I"}, 3600));
   EXPECT_EQ(calls,
-            (Texts{"prepare file:old", "flags 21 file:",
-                   "filter process == %@ p1; process == %@ p2; senderImagePath CONTAINS[cd] %@ I; ",
-                   "event handler", "invalidation handler",
-                   "Getting oslog stream: history = 3600.000000", "activate"}));
+            "prepare file:old\nflags 21 file:\n"
+            "filter process == %@ p1; process == %@ p2; senderImagePath CONTAINS[cd] %@ I; \n"
+            "event handler\ninvalidation handler\n"
+            "Getting oslog stream: history = 3600.000000\nactivate\n");
   EXPECT_GE(start, before.addingSeconds(-3600));
   EXPECT_LE(start, OSLogDate::now().addingSeconds(-3600));
   EXPECT_EQ(readFile(output), line);
@@ -172,20 +158,18 @@ TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
 }
 
 TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
-  const std::string history = "Getting oslog stream: history = ";
-  forEachRow("oslog-command", 3, [&](const Row& row) {
+  forEachRow("oslog-command", 3, [this](const Row& row) {
     calls.clear();
+    std::filesystem::remove(output);
     auto words = convertLineToList(row[0]);
     std::ranges::replace(words, "OUT", output);
     const auto group = dispatch::group::create();
     EXPECT_TRUE(OsLogHandler()(group, words));
     EXPECT_TRUE(group.wait(0ns));
-    std::string asked;
-    for (const auto& call : calls) {
-      if (call.starts_with("filter")) asked += call;
-      if (call.starts_with(history)) asked += call.substr(history.size());
-    }
-    EXPECT_EQ(asked, row[1] + row[2]);
+    EXPECT_EQ(calls, "prepare file:\nflags 21 file:\n" + row[1] +
+                         "event handler\ninvalidation handler\n"
+                         "Getting oslog stream: history = " +
+                         row[2] + "\nactivate\n");
     thread.join();
   });
 }
@@ -203,21 +187,27 @@ TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {
             "proc(image):sub.sys [cat] " +
                 message + "\n");
   EXPECT_EQ(std::filesystem::status(output).permissions(), std::filesystem::perms(0600));
-  EXPECT_EQ(errors, Texts());
+  EXPECT_EQ(errors, "");
 }
 
 TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
-  prepare = Prepare::fails;
+  const auto succeed = prepare;
+  prepare = [](const auto& handler) { handler(nullptr, "locked"); };
   EXPECT_FALSE(put());
-  EXPECT_EQ(errors, (Texts{"Could not open: locked", "Failed to prepare oslog stream"}));
+  EXPECT_EQ(errors, "Could not open: locked\nFailed to prepare oslog stream\n");
   EXPECT_NE(access(output.c_str(), F_OK), 0) << "the file is made only for a stream";
   errors.clear();
-  prepare = Prepare::comesLate;
+  prepare = [&](const auto& handler) {
+    thread = std::thread([&, handler] {  // which learns of nothing else that was done
+      while (!stopped.load(std::memory_order_relaxed)) std::this_thread::yield();
+      succeed(handler);
+    });
+  };
   EXPECT_FALSE(put());
   stopped.store(true, std::memory_order_relaxed);
   thread.join();
-  EXPECT_EQ(errors, Texts{"Failed to prepare oslog stream"});
-  prepare = Prepare::succeeds;
+  EXPECT_EQ(errors, "Failed to prepare oslog stream\n");
+  prepare = succeed;
   const int sealed = memfd_create("", MFD_CLOEXEC | MFD_ALLOW_SEALING);
   const auto onlyGrowing = "/proc/self/fd/" + std::to_string(sealed);
   writeFile(onlyGrowing, "old");
@@ -225,7 +215,7 @@ TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
   for (const auto& path : {folder.path("no/such"), onlyGrowing, output + std::string("\0cut", 4)}) {
     errors.clear();
     EXPECT_FALSE(OsLogStreamClock::put(60s, path));
-    EXPECT_EQ(errors, Texts{"Failed to create file: " + path});
+    EXPECT_EQ(errors, "Failed to create file: " + path + "\n");
   }
   EXPECT_EQ(readFile(onlyGrowing), "old");
   close(sealed);
@@ -234,7 +224,7 @@ TEST_F(OsLogStreamTest, NamesWhatKeepsItFromStarting) {
 TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
   reason = 7;
   EXPECT_TRUE(put()) << "the log store ended the stream, for whatever reason";
-  EXPECT_EQ(errors, Texts{"Invalid oslog stream: reason = 7"});
+  EXPECT_EQ(errors, "Invalid oslog stream: reason = 7\n");
   thread.join();
   events.resize(3);
   for (const auto& [path, message, why] :
@@ -244,8 +234,8 @@ TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
     output = path;
     events[0].message = message;
     EXPECT_FALSE(put());
-    EXPECT_EQ(errors, (Texts{"Failed to write file: " + output + ": " + why,
-                             "Invalid oslog stream: reason = 1"}));
+    EXPECT_EQ(errors, "Failed to write file: " + output + ": " + why +
+                          "\nInvalid oslog stream: reason = 1\n");
     invalidated = false;
     thread.join();
   }
@@ -265,8 +255,7 @@ TEST_F(OsLogStreamTest, GivesUpOnAStreamThatDoesNotEndAndWritesNoMoreOfIt) {
   const auto later = readFile(output);
   EXPECT_LE(later.size(), written.size() + line.size()) << "but for a line that was under way";
   EXPECT_TRUE(later.ends_with(line));
-  std::ranges::sort(errors);  // written by two threads
-  EXPECT_EQ(errors, (Texts{"Invalid oslog stream: reason = 1", "Timeout on getting oslog stream"}));
+  EXPECT_EQ(errors, "Timeout on getting oslog stream\nInvalid oslog stream: reason = 1\n");
 }
 
 TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
@@ -280,13 +269,7 @@ TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
     EXPECT_EQ(poll(&readable, 1, 60'000), 1);
   };
   EXPECT_FALSE(put(0ns));
-  fcntl(reader, F_SETFL, 0);
-  std::string text;
-  char piece[65536];
-  ssize_t length = 0;
-  while ((length = read(reader, piece, sizeof piece)) > 0) {
-    text.append(piece, static_cast<std::size_t>(length));
-  }
+  const auto text = readFile(output);
   const auto whole = line.substr(0, line.size() - 2) + events[0].message + "\n";
   EXPECT_TRUE(text == whole) << "the line under way, and none after it: " << text.size();
   close(reader);
@@ -294,18 +277,16 @@ TEST_F(OsLogStreamTest, WritesToAPipeAndDoesNotHangOnItsReader) {
 
 }  // namespace
 
+// Nothing here is the owner of the test.
 std::shared_ptr<OSLogEventStore> OSLogEventStore::localStore() {
-  return std::make_shared<ScriptedStore>();
+  return {OsLogStreamTest::current, [](auto*) {}};
 }
 
 std::shared_ptr<OSLogEventStream> OSLogEventStream::initWithSource(
     std::shared_ptr<OSLogEventSource> /*source*/) {
-  return std::make_shared<ScriptedStream>();
+  return {OsLogStreamTest::current, [](auto*) {}};
 }
 
-void platform::logError(const std::string& message) {
-  const std::lock_guard lock(script->mutex);
-  (message.starts_with("Getting ") ? script->calls : script->errors).push_back(message);
-}
+void platform::logError(const std::string& message) { OsLogStreamTest::current->logError(message); }
 
 bool posix::isReadByDevice(const std::string& /*path*/) { return false; }
