@@ -1,16 +1,15 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <chrono>
-#include <ctime>
-#include <thread>
+#include <new>
 
 #include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
 #include "platform/host/device/Device.h"
-#include "platform/host/device/Requests.h"
 #include "tests/CapturedOutput.h"
+#include "tests/FailingAllocations.h"
 #include "tests/Table.h"
+#include "tool/ServerState.h"
 #include "tool/ZUBCommand.h"
 
 namespace {
@@ -37,23 +36,6 @@ TEST(TraceNames, FollowTheVendorButTheCoreDumpSuffixOnlyOnce) {
   EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-qdss");
 }
 
-TEST(Answers, HaveTheTimeOfDayToTheMillisecond) {
-  using namespace std::chrono;
-  setenv("TZ", "<+0545>-5:45", 1);
-  tzset();
-  const auto before = ceil<seconds>(system_clock::now());
-  std::this_thread::sleep_until(before);  // when the milliseconds have zeros in front
-  const auto text = host::timestampOr(std::nullopt);
-  std::tm local{};
-  const auto* const rest = strptime(text.c_str(), "%Y-%m-%d-%H-%M-%S-", &local);
-  ASSERT_TRUE(rest && text.size() == 23) << text;
-  const auto at =
-      system_clock::from_time_t(timegm(&local)) - 5h - 45min + milliseconds(std::stoi(rest));
-  EXPECT_TRUE(before <= at && at <= system_clock::now()) << text;
-  unsetenv("TZ");
-  tzset();
-}
-
 TEST(ZUBCommand, FlushesEachLineAndGivesAllBack) {
   const auto queueThread = dispatch::group::create();
   std::weak_ptr<zub::client::Manager> manager;
@@ -75,6 +57,38 @@ TEST(ZUBCommand, FlushesEachLineAndGivesAllBack) {
   }
   EXPECT_TRUE(manager.expired());
   EXPECT_TRUE(queueThread.wait(std::chrono::seconds(60)));
+}
+
+TEST(ZUBCommand, OutlivesEachAllocationOfACollectionThatFails) {
+  const dispatch::queue queue("test");
+  host::device().server[0].state = "a state that takes memory";
+  const auto followed = zub::client::CreateManager("followed", queue);
+  host::device() = {};
+  zub::client::RegisterEventHandler(
+      followed, zub::kEventServerStateChange,
+      [](const lumo::object& payload, const auto&) { SetServerState(payload); });
+  for (const std::string handler : {"tel", "core", "bb"}) {
+    bool failed = true;
+    for (int nth = 1; failed; ++nth) {
+      const CapturedOutput out;
+      std::cout << "this takes the memory for all of the output" << std::endl;
+      bool succeeded = false;
+      {
+        const FailingAllocation failing(nth);
+        try {
+          zub::client::EventsOff(followed);
+          zub::client::EventsOn(followed);
+          const auto manager = zub::client::CreateManager("test", queue);
+          const auto root = ZUBCommand::create("zubtool", {}, manager, queue);
+          succeeded = root->getSubCommandObj("logdump")->execCommand(handler, {"reason"});
+        } catch (const std::bad_alloc&) {
+        }
+        failed = FailingAllocation::hasFailed();
+      }
+      EXPECT_TRUE(!succeeded || out.str().find("og collection") != std::string::npos) << handler;
+      EXPECT_TRUE(failed || out.str().find("\n$Path = ") != std::string::npos) << out.str();
+    }
+  }
 }
 
 }  // namespace
