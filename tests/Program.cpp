@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 #include <pty.h>
 #include <sys/prctl.h>
+#include <sys/socket.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -41,32 +42,26 @@ Program::Program(const Start& start) {
             start.profile + "\nrequest-log = " + scratch->path("requests") + "\n");
   const termios settings = terminalBefore();
   const winsize size = {.ws_row = 24, .ws_col = 80, .ws_xpixel = 0, .ws_ypixel = 0};
-  int input[2];
-  int output[2];
-  if (pipe2(input, O_CLOEXEC) != 0 || pipe2(output, O_CLOEXEC) != 0) throw std::bad_alloc();
-  // As another program that shares them may have left them.
-  fcntl(input[0], F_SETFL, O_NONBLOCK);
-  fcntl(output[1], F_SETFL, O_NONBLOCK);
-  process = start.onTerminal ? forkpty(&out, nullptr, &settings, &size) : fork();
+  int ends[2];
+  if (socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends) != 0) throw std::bad_alloc();
+  fcntl(ends[1], F_SETFL, O_NONBLOCK);  // as another program that shares it may have left it
+  process = start.onTerminal ? forkpty(&streams, nullptr, &settings, &size) : fork();
   if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
-  if (process == 0) execute(start, input[0], output[1]);
-  close(input[0]);
-  close(output[1]);
-  in = start.onTerminal ? out : input[1];
+  if (process == 0) execute(start, ends[1]);
+  close(ends[1]);
   if (start.onTerminal) {
-    close(input[1]);
-    close(output[0]);
+    close(ends[0]);
   } else {
-    out = output[0];
+    streams = ends[0];
   }
-  type(start.input);
+  if (!start.input.empty()) type(start.input);  // the program may have ended by now
 }
 
-void Program::execute(const Start& start, int input, int output) const {
+void Program::execute(const Start& start, int end) const {
   prctl(PR_SET_PDEATHSIG, SIGKILL);  // a test that is given up takes its program along
   if (!start.onTerminal) {
-    dup2(input, STDIN_FILENO);
-    dup2(output, STDOUT_FILENO);
+    dup2(end, STDIN_FILENO);
+    dup2(end, STDOUT_FILENO);
     dup2(open(scratch->path("err").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600), STDERR_FILENO);
   }
   setenv("TZ", "UTC", 1);
@@ -100,21 +95,21 @@ termios Program::terminalBefore() {
 }
 
 void Program::type(const std::string& text) const {
-  if (write(in, text.data(), text.size()) < 0) perror("standard input of the program");
+  if (write(streams, text.data(), text.size()) < 0) perror("standard input of the program");
 }
 
 std::string Program::readUntil(const std::string& end) const {
   std::string text;
-  for (char byte = 0; (end.empty() || !text.ends_with(end)) && read(out, &byte, 1) == 1;) {
+  for (char byte = 0; (end.empty() || !text.ends_with(end)) && read(streams, &byte, 1) == 1;) {
     text += byte;
   }
   return text;
 }
 
 Outcome Program::finish() {
-  if (in != out) close(in);
+  shutdown(streams, SHUT_WR);  // a terminal takes no notice
   Outcome outcome{.out = readUntil("")};
-  close(out);
+  close(streams);
   int status = 0;
   waitpid(process, &status, 0);
   outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status);

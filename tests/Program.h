@@ -47,7 +47,8 @@ struct Outcome {
 /// Compares each part by itself, so that the lines which differ are shown.
 void expectOutcome(const Outcome& actual, const Outcome& expected);
 
-/// A started program. Its standard streams are pipes, or a terminal.
+/// A started program. Its standard input and output are a socket, or a terminal with standard
+/// error.
 class Program {
  public:
   explicit Program(const Start& start);
@@ -65,14 +66,13 @@ class Program {
   static termios terminalBefore();
 
   pid_t pid() const { return process; }
-  int terminal() const { return out; }  ///< its controlling side, where the program has one
+  int terminal() const { return streams; }  ///< its controlling side, where the program has one
 
  private:
-  [[noreturn]] void execute(const Start& start, int input, int output) const;
+  [[noreturn]] void execute(const Start& start, int end) const;
 
   std::shared_ptr<ScratchFolder> scratch = std::make_shared<ScratchFolder>();
-  int in = -1;  // the same as `out` where that is a terminal
-  int out = -1;
+  int streams = -1;  // the other end of its standard streams
   pid_t process = -1;
 };
 
