@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <functional>
 #include <iomanip>
 #include <iostream>
 #include <sstream>
@@ -28,12 +27,8 @@ void typeIn(const std::string& text) {
 /// refuses for names with "no" in front, and "path:handler(words)" for a run.
 class Node : public CommandBase {
  public:
-  using Build = std::function<void(Node&)>;
-
-  static std::shared_ptr<Node> create(const std::string& word, std::weak_ptr<CommandBase> above,
-                                      Build build) {
+  static std::shared_ptr<Node> create(const std::string& word, std::weak_ptr<CommandBase> above) {
     std::shared_ptr<Node> node(new Node(word, std::move(above)));
-    node->build = std::move(build);
     node->init();
     return node;
   }
@@ -55,27 +50,33 @@ class Node : public CommandBase {
         },
         help, note);
   }
-  void child(const std::string& word, Build buildChild) {
-    addSubCommand(word, create(word, weak_from_this(), std::move(buildChild)));
+  /// Adds the handlers of a list of paths, and the sub-commands on their way.
+  void add(const std::string& paths) {
+    std::istringstream list(paths);
+    for (std::string path; list >> path;) {
+      const auto slash = path.find('/');
+      const auto word = path.substr(0, slash);
+      if (slash == std::string::npos) {
+        handler(word);
+        continue;
+      }
+      if (!isValidSubCommand(word)) addSubCommand(word, create(word, weak_from_this()));
+      std::static_pointer_cast<Node>(getSubCommandObj(word))->add(path.substr(slash + 1));
+    }
   }
 
  private:
   using CommandBase::CommandBase;
-  void registerCommands() override { build(*this); }
-  Build build;
+  void registerCommands() override {}
 };
 
-/// a succeeds, f fails; s is a sub-command with a, the sub-command t below it, and the names of
-/// three of the shell's words; both is a handler and a sub-command.
-void buildTree(Node& root) {
-  for (const auto* const word : {"a", "nohandler", "both"}) root.handler(word);
-  root.handler("f", false);
-  root.child("both", [](Node&) {});
-  root.child("nosub", [](Node& node) { node.handler("a"); });
-  root.child("s", [](Node& node) {
-    for (const auto* const word : {"a", "cd", "help", "quit"}) node.handler(word);
-    node.child("t", [](Node& deep) { deep.handler("a"); });
-  });
+/// All succeed but f; s has the names of three of the shell's words; both is a handler and a
+/// sub-command.
+std::shared_ptr<Node> createTree() {
+  auto root = Node::create("r", {});
+  root->add("a both both/only nohandler nosub/a s/a s/cd s/help s/quit s/t/a");
+  root->handler("f", false);
+  return root;
 }
 
 class TestShell : public CommandShell {
@@ -85,7 +86,7 @@ class TestShell : public CommandShell {
 
  private:
   std::shared_ptr<CommandBase> createRootCommand() override {
-    return hasTree ? Node::create("r", {}, buildTree) : nullptr;
+    return hasTree ? createTree() : nullptr;
   }
 };
 
@@ -112,11 +113,9 @@ TEST(Shell, RunsCommandLinesAndTypedLines) {
 }
 
 TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
-  const auto root = Node::create("r", {}, [](Node& node) {
-    buildTree(node);
-    node.handler("opt", true, "[fast|slow|tar.gz] <why> does [it]", "takes minutes");
-    node.handler("out", true, "[how many] [output file path] -p <a b..> -i <c> writes -x");
-  });
+  const auto root = createTree();
+  root->handler("opt", true, "[fast|slow|tar.gz] <why> does [it]", "takes minutes");
+  root->handler("out", true, "[how many] [output file path] -p <a b..> -i <c> writes -x");
   const ScratchFolder folder;
   std::filesystem::create_directory(folder.path("logs"));
   for (const auto* const name : {"one.txt", ".hidden", "a name", "logs/new.txt"}) {
@@ -154,23 +153,14 @@ TEST(Shell, NeedsATreeAndReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) 
 }
 
 TEST(Command, ShowsItsTablesInOrderAndRunsWhatIsInThem) {
-  const auto root = Node::create("root", {}, [](Node& node) {
-    node.handler("b", false, "earlier");
-    node.handler("b", false, "[x|y] does b");
-    node.handler("b");  // an empty help keeps the one before
-    node.addCommandHandler("null", {}, "help of nothing");
-    node.handler("exactly16letters");
-    node.handler("seventeen-letters");
-    node.handler("Z", true, "upper case first");
-    node.child("z", [](Node& one) { one.handler("only"); });
-    node.child("hidden", [](Node& silent) {
-      silent.child("deep", [](Node& deep) {
-        deep.handler("q");
-        deep.handler("p");
-        deep.child("deeper", [](Node& deeper) { deeper.handler("r"); });
-      });
-    });
-  });
+  const auto root = Node::create("root", {});
+  root->handler("b", false, "earlier");
+  root->handler("b", false, "[x|y] does b");
+  root->add("b");  // an empty help keeps the one before
+  root->addCommandHandler("null", {}, "help of nothing");
+  root->handler("Z", true, "upper case first");
+  root->add("exactly16letters seventeen-letters z/only");
+  root->add("hidden/deep/q hidden/deep/p hidden/deep/deeper/r");
   const CapturedOutput out;
   std::cout << std::left << std::setfill('*') << std::setw(20);  // what others have left there
   root->CommandBase::displayHelp();
