@@ -4,12 +4,8 @@
 #include <cstdlib>
 #include <new>
 
-namespace {
-
-std::atomic<int> left =
-    -1;  // allocations up to the one that fails, 0 after it; -1: none is to fail
-
-}  // namespace
+// Allocations up to the one that fails, 0 after it; -1: none is to fail.
+static std::atomic<int> left = -1;
 
 FailingAllocation::FailingAllocation(int nth) { left = nth; }
 FailingAllocation::~FailingAllocation() { left = -1; }

@@ -2,8 +2,8 @@
 
 #include <algorithm>
 #include <new>
+#include <sstream>
 
-#include "logdump/TraceNames.h"
 #include "logdump/TraceProperty.h"
 #include "platform/host/device/Device.h"
 #include "tests/CapturedOutput.h"
@@ -16,24 +16,17 @@ namespace {
 
 TEST(TraceProperty, ReadsWordsAndNumbers) {
   forEachRow("trace-property", 3, [](const Row& row) {
-    const auto mode = ParseTraceMode(row[0]);
-    EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]);
-    for (const bool before : {false, true}) {
-      bool after = before;
-      parseBoolProperty(row[0], after);
-      EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true");
+    std::istringstream texts(row[0]);
+    for (std::string text; std::getline(texts, text, ',');) {
+      const auto mode = ParseTraceMode(text);
+      EXPECT_EQ(mode ? std::to_string(*mode) : "-", row[1]) << text;
+      for (const bool before : {false, true}) {
+        bool after = before;
+        parseBoolProperty(text, after);
+        EXPECT_EQ(after, row[2] == "-" ? before : row[2] == "true") << text;
+      }
     }
   });
-}
-
-TEST(TraceNames, FollowTheVendorButTheCoreDumpSuffixOnlyOnce) {
-  auto& vendor = host::device().radioVendor;
-  vendor = kTelephonyRadioVendorKOV;
-  EXPECT_EQ(zub::trace::getCoreDumpDirSuffix(), "-coredump");
-  EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-bb-trace");
-  vendor = host::Profile().radioVendor;
-  EXPECT_EQ(zub::trace::getCoreDumpDirSuffix(), "-coredump");
-  EXPECT_EQ(zub::trace::getBasebandTraceDirSuffix(true), "-qdss");
 }
 
 TEST(ZUBCommand, FlushesEachLineAndGivesAllBack) {
