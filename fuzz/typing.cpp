@@ -11,7 +11,7 @@
 #include <utility>
 #include <vector>
 
-#include "tests/Typist.h"
+#include "fuzz/Typist.h"
 
 namespace {
 

@@ -127,8 +127,6 @@ TEST(Dates, AreInALocalZoneWithItsSummerTime) {
     EXPECT_EQ(local.secondsFromGMT(OSLogDate(1'711'848'620'000'000)), 7'200);
   })
       .join();
-  unsetenv("TZ");
-  tzset();
 }
 
 }  // namespace
