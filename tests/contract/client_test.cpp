@@ -45,16 +45,15 @@ TEST_F(Client, CompletesOnceOnTheQueueAndReleasesTheCompletionBeforeTheNextTask)
     int calls = 0;
     auto owned = std::make_shared<int>();
     const std::weak_ptr<int> completion(owned);
-    zub::client::PerformCommand(
-        manager, zub::kCommandGetTraceProperty,
-        [&, owned = std::move(owned), member = dispatch::membership(answered)](const auto& result,
-                                                                               const auto& reply) {
-          ++calls;
-          EXPECT_EQ(std::this_thread::get_id(), thread);
-          EXPECT_TRUE(result.code == 0 || !reply.isDict()) << result.message;
-          queue.async([&completion, member] { EXPECT_TRUE(completion.expired()); });
-        },
-        propertyRequest(property));
+    auto complete = [&, owned = std::move(owned), member = dispatch::membership(answered)](
+                        const auto& result, const auto& reply) {
+      ++calls;
+      EXPECT_EQ(std::this_thread::get_id(), thread);
+      EXPECT_TRUE(result.code == 0 || !reply.isDict()) << result.message;
+      queue.async([&completion, member] { EXPECT_TRUE(completion.expired()); });
+    };
+    zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty, std::move(complete),
+                                propertyRequest(property));
     ASSERT_TRUE(answered.wait(60s));
     EXPECT_EQ(calls, 1);
   }
