@@ -49,11 +49,8 @@ Program::Program(const Start& start) {
   if (process < 0) throw std::system_error(errno, std::generic_category(), "fork");
   if (process == 0) execute(start, ends[1]);
   close(ends[1]);
-  if (start.onTerminal) {
-    close(ends[0]);
-  } else {
-    streams = ends[0];
-  }
+  if (start.onTerminal) close(ends[0]);
+  if (!start.onTerminal) streams = ends[0];
   if (!start.input.empty()) type(start.input);  // the program may have ended by now
 }
 
