@@ -73,13 +73,6 @@ TEST(Profile, RefusesWhatItDoesNotUnderstand) {
   });
 }
 
-TEST(Profile, HasItsKeysInTheManual) {
-  const auto manual = readFile(ZUBTOOL_SOURCES "/docs/zub-device.5");
-  for (const auto key : host::profileKeys()) {
-    EXPECT_NE(manual.find("\n.It Ic " + std::string(key)), std::string::npos) << key;
-  }
-}
-
 TEST(Profile, ThoseThatShipAreGood) {
   for (const auto& file : std::filesystem::directory_iterator(ZUBTOOL_SOURCES "/devices")) {
     Profile profile;

@@ -79,4 +79,7 @@ check_same 'zubtool(1) should name other words (<) than it does (>)' "$(printf '
 check_same 'the keys and defaults of zub-device(5) should be those (<) of phone.device' \
   "$(sed 's/ *#.*//; s/ = / No = /' ../devices/phone.device)"$'\nrequest-log' \
   "$(sed -n 's/^\.It Ic //p' ../docs/zub-device.5)"
+check_same 'the keys of zub-device(5) should be those (<) that a profile may set' \
+  "$(find_all '^    \{"\K[a-z-]+(?=", )' <../platform/host/device/Profile.cpp)" \
+  "$(find_all '^\.It Ic \K\S+' <../docs/zub-device.5)"
 exit "$failed"

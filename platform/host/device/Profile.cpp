@@ -257,12 +257,6 @@ std::string readLine(Text line, Profile& profile, FirstLines& firstLines, int nu
 
 }  // namespace
 
-std::vector<std::string_view> profileKeys() {
-  std::vector<std::string_view> names;
-  for (const Key& key : kKeys) names.push_back(key.name);
-  return names;
-}
-
 std::optional<std::string> parseProfile(std::string_view text, const std::string& file,
                                         Profile& profile) {
   constexpr Text kByteOrderMark = "\xEF\xBB\xBF";

@@ -67,9 +67,6 @@ struct Profile {
   friend bool operator==(const Profile&, const Profile&) = default;
 };
 
-/// The keys that a profile may set.
-std::vector<std::string_view> profileKeys();
-
 /// Reads `text`, the contents of the profile `file`, into `profile`. Keys that it does not set keep
 /// their values. The path of a log is relative to the folder of `file`. Returns the first fault as
 /// "FILE:LINE: what", or nothing.
