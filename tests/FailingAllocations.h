@@ -5,8 +5,6 @@ class FailingAllocation {
  public:
   /// The `nth` allocation from now on throws `std::bad_alloc`.
   explicit FailingAllocation(int nth);
-  FailingAllocation(const FailingAllocation&) = delete;
-  FailingAllocation& operator=(const FailingAllocation&) = delete;
   ~FailingAllocation();
 
   static bool hasFailed();

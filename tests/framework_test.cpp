@@ -40,16 +40,15 @@ class Node : public CommandBase {
   void displayHelp() override { std::cout << "help " << getHierarchy() << ' '; }
   void handler(const std::string& word, bool result = true, const std::string& help = "",
                const std::string& note = "") {
-    addCommandHandler(
-        word,
-        [this, word, result](const dispatch::group&, Words words) {
-          std::cout << getHierarchy() << ':' << word << '(';
-          while (!words.empty()) std::cout << '<' << TakeNextWord(words) << '>';
-          std::cout << ") ";
-          return result;
-        },
-        help, note);
+    const auto run = [this, word, result](const dispatch::group&, Words words) {
+      std::cout << getHierarchy() << ':' << word << '(';
+      while (!words.empty()) std::cout << '<' << TakeNextWord(words) << '>';
+      std::cout << ") ";
+      return result;
+    };
+    addCommandHandler(word, run, help, note);
   }
+
   /// Adds the handlers of a list of paths, and the sub-commands on their way.
   void add(const std::string& paths) {
     std::istringstream list(paths);
@@ -168,13 +167,11 @@ TEST(Command, ShowsItsTablesInOrderAndRunsWhatIsInThem) {
   std::cout.copyfmt(std::ios(nullptr));
   forEachRow("help", 1, [&out](const Row& row) { EXPECT_EQ(out.str(), row[0]); });
   EXPECT_TRUE(root->execCommand("b", {}));
-  root->addCommandHandler(
-      "anew",
-      [&root, own = std::make_shared<int>()](auto, auto) {
-        root->handler("anew");
-        return own.use_count() == 1;
-      },
-      "");
+  auto renew = [&root, own = std::make_shared<int>()](auto, auto) {
+    root->handler("anew");
+    return own.use_count() == 1;
+  };
+  root->addCommandHandler("anew", std::move(renew), "");
   EXPECT_TRUE(root->execCommand("anew", {}));
   EXPECT_FALSE(root->execCommand("null", {}) || root->execCommand("none", {}));
 }
