@@ -51,7 +51,7 @@ extern "C" void onWaking(int signal) { (signal == SIGCONT ? gWasContinued : gWas
 extern "C" void onEnding(int signal) {
   const int errorBefore = errno;
   leave();
-  raise(signal);  // here the process ends, or stops and goes on
+  takeEffect(signal);
   handle(signal, kOnce, onEnding);
   gWasContinued = 1;
   errno = errorBefore;
@@ -93,6 +93,16 @@ std::vector<int> endingSignals() {
     if (now.sa_handler == SIG_DFL) ending.push_back(signal);
   }
   return ending;
+}
+
+void takeEffect(int signal) {
+  sigset_t only;
+  sigset_t before;
+  sigemptyset(&only);
+  sigaddset(&only, signal);
+  raise(signal);
+  pthread_sigmask(SIG_UNBLOCK, &only, &before);  // here the process ends, or stops and goes on
+  pthread_sigmask(SIG_SETMASK, &before, nullptr);
 }
 
 bool hasTerminal(int descriptor) {

@@ -12,6 +12,10 @@ namespace host {
 /// that it ignores or handles, and none of a fault of its own.
 std::vector<int> endingSignals();
 
+/// Has `signal`, which has no handler, take effect on the calling thread. Returns where it has only
+/// stopped the process, which has gone on. Safe in a handler of signals.
+void takeEffect(int signal);
+
 /// Whether no other job has the terminal of `descriptor`.
 bool hasTerminal(int descriptor);
 

@@ -113,12 +113,7 @@ class WorkLine {
     if (::read(signals.get(), &taken, sizeof taken) != sizeof taken) return;
     const std::lock_guard lock(gMutex);
     clear();
-    sigset_t only;
-    sigemptyset(&only);
-    sigaddset(&only, static_cast<int>(taken.ssi_signo));
-    raise(static_cast<int>(taken.ssi_signo));
-    pthread_sigmask(SIG_UNBLOCK, &only, nullptr);  // here the process ends, or stops and goes on
-    pthread_sigmask(SIG_BLOCK, &only, nullptr);
+    host::takeEffect(static_cast<int>(taken.ssi_signo));
   }
 
   const steady_clock::time_point begin = steady_clock::now();
