@@ -148,7 +148,7 @@ class Terminal : public testing::Test {
 };
 
 TEST_F(Terminal, IsAsItWasWhileACommandRuns) {
-  start("linux", "1500");  // milliseconds, in which it says that it runs
+  start("linux", "2500");  // milliseconds, in which it says that it runs
   program->type(kTel + "a\r");
   read("running 0:01");
   EXPECT_TRUE(isAsItWas(program->terminal()));
