@@ -143,6 +143,19 @@ class Terminal : public testing::Test {
     EXPECT_EQ(outcome.status, status);
   }
 
+  /// Ctrl-S.
+  void stopOutput() {
+    auto settings = Program::terminalBefore();
+    settings.c_iflag |= IXON;
+    tcsetattr(program->terminal(), TCSANOW, &settings);
+    int inPackets = 1;  // which show that the terminal has taken the key
+    ioctl(program->terminal(), TIOCPKT, &inPackets);
+    program->type("\023");
+    pollfd taken = {program->terminal(), POLLIN | POLLPRI, 0};
+    while ((taken.revents & POLLPRI) == 0) poll(&taken, 1, -1);
+    ioctl(program->terminal(), TIOCPKT, &(inPackets = 0));
+  }
+
   std::optional<Program> program;
   std::string printed;
 };
@@ -160,11 +173,14 @@ TEST_F(Terminal, IsAsItWasWhileACommandRuns) {
 }
 
 TEST_F(Terminal, ShowsNothingOfWorkThatASignalEnds) {
-  start("vt100", "60000");
-  program->type(kTel + "a\r");
-  read("running 0:01\033[K");
-  kill(program->pid(), SIGTERM);
-  expectEnd("\r\033[K", 1000 + SIGTERM);
+  for (const bool isStopped : {false, true}) {
+    start("vt100", "60000");
+    program->type(kTel + "a\r");
+    read("running 0:01\033[K");
+    if (isStopped) stopOutput();
+    kill(program->pid(), SIGTERM);
+    expectEnd(isStopped ? "" : "\r\033[K", 1000 + SIGTERM);
+  }
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {

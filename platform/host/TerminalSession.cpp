@@ -33,8 +33,7 @@ void leave() {
   gIsEditing = 0;
   if (!hasTerminal(STDIN_FILENO)) return;
   tcsetattr(STDIN_FILENO, TCSANOW, &gBefore);
-  pollfd output = {STDOUT_FILENO, POLLOUT, 0};
-  if (::poll(&output, 1, 0) <= 0) return;
+  if (!takesOutput(STDOUT_FILENO)) return;
   std::ignore = ::write(STDOUT_FILENO, kMarkNoPastes.data(), kMarkNoPastes.size());
 }
 
@@ -110,6 +109,11 @@ bool hasTerminal(int descriptor) {
   return owner < 0 || owner == getpgrp();
 }
 
+bool takesOutput(int descriptor) {
+  pollfd output = {descriptor, POLLOUT, 0};
+  return ::poll(&output, 1, 0) > 0;
+}
+
 bool canMoveCursor(int descriptor) {
   const char* const kind = std::getenv("TERM");
   return kind != nullptr && *kind != '\0' && std::string_view(kind) != "dumb" &&
@@ -124,9 +128,6 @@ TerminalSize sizeOfTerminal() {
 }
 
 TerminalSession::TerminalSession() {
-  sigset_t all;
-  sigfillset(&all);
-  pthread_sigmask(SIG_SETMASK, &all, &signalsBefore);
   for (const int signal : ending) handle(signal, kOnce, onEnding);
   for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, onWaking);
   enter();
@@ -136,13 +137,12 @@ TerminalSession::~TerminalSession() {
   leave();
   for (const int signal : ending) handle(signal, 0, SIG_DFL);
   for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, SIG_DFL);
-  pthread_sigmask(SIG_SETMASK, &signalsBefore, nullptr);
 }
 
 /// Takes the terminal. In the background that stops the process until it is in the foreground.
 void TerminalSession::enter() {
   {
-    const SignalMask now(signalsBefore);
+    const SignalMask now(blocked.before());
     while (tcdrain(STDIN_FILENO) != 0 && errno == EINTR) {
     }
   }
@@ -170,13 +170,13 @@ TerminalSession::Event TerminalSession::wait(int milliseconds) {
       return Event::resized;
     }
     if (ready >= 0) return ready > 0 ? Event::input : Event::timeout;
-    ready = ppoll(&input, 1, milliseconds < 0 ? nullptr : &limit, &signalsBefore);
+    ready = ppoll(&input, 1, milliseconds < 0 ? nullptr : &limit, &blocked.before());
   }
 }
 
 std::optional<char> TerminalSession::read() {
   constexpr char kCtrlD = 4;
-  const SignalMask now(signalsBefore);
+  const SignalMask now(blocked.before());
   char byte = 0;
   if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return std::nullopt;
   const bool isAhead = typedAhead > 0;
@@ -185,7 +185,7 @@ std::optional<char> TerminalSession::read() {
 }
 
 void TerminalSession::write(std::string_view text) {
-  const SignalMask now(signalsBefore);
+  const SignalMask now(blocked.before());
   std::ignore = posix::writeAll(STDOUT_FILENO, text);
 }
 

@@ -6,6 +6,8 @@
 #include <string_view>
 #include <vector>
 
+#include "platform/posix/SignalsBlocked.h"
+
 namespace host {
 
 /// The signals that, as their dispositions stand, end or stop the process when it is sent one: none
@@ -18,6 +20,9 @@ void takeEffect(int signal);
 
 /// Whether no other job has the terminal of `descriptor`.
 bool hasTerminal(int descriptor);
+
+/// Whether the terminal of `descriptor` takes output at once: Ctrl-S has not stopped it.
+bool takesOutput(int descriptor);
 
 /// Whether `descriptor` is a terminal that can move its cursor: TERM is set, and is not "dumb".
 bool canMoveCursor(int descriptor);
@@ -71,8 +76,8 @@ class TerminalSession {
   void enter();
 
   const std::vector<int> ending = endingSignals();
-  sigset_t signalsBefore{};  // that were blocked
-  int typedAhead = 0;        // bytes
+  const posix::SignalsBlocked blocked;
+  int typedAhead = 0;  // bytes
 };
 
 }  // namespace host

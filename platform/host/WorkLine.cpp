@@ -97,6 +97,7 @@ class WorkLine {
   void draw() const {
     const std::lock_guard lock(gMutex);
     if (!gMayShow || !host::hasTerminal(STDOUT_FILENO)) return;
+    if (!host::takesOutput(STDOUT_FILENO)) return;
     if (wasLineTyped()) return clear();
     const auto time = std::chrono::floor<std::chrono::seconds>(steady_clock::now() - begin);
     std::string text = "\rrunning ";
@@ -107,12 +108,13 @@ class WorkLine {
     gIsShown = true;
   }
 
-  /// Has a signal do what it does by default.
+  /// Has a signal do what it does by default, at once: it never waits for a terminal that Ctrl-S has
+  /// stopped, nor for a thread that does.
   void takeSignal() const {
     signalfd_siginfo taken{};
     if (::read(signals.get(), &taken, sizeof taken) != sizeof taken) return;
-    const std::lock_guard lock(gMutex);
-    clear();
+    const std::unique_lock lock(gMutex, std::try_to_lock);
+    if (lock && host::takesOutput(STDOUT_FILENO)) clear();
     host::takeEffect(static_cast<int>(taken.ssi_signo));
   }
 

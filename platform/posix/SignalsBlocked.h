@@ -14,14 +14,17 @@ class SignalsBlocked {
     for (const int fault : {SIGSEGV, SIGBUS, SIGFPE, SIGILL, SIGTRAP, SIGSYS}) {
       sigdelset(&sent, fault);
     }
-    pthread_sigmask(SIG_BLOCK, &sent, &before);
+    pthread_sigmask(SIG_BLOCK, &sent, &maskBefore);
   }
   SignalsBlocked(const SignalsBlocked&) = delete;
   SignalsBlocked& operator=(const SignalsBlocked&) = delete;
-  ~SignalsBlocked() { pthread_sigmask(SIG_SETMASK, &before, nullptr); }
+  ~SignalsBlocked() { pthread_sigmask(SIG_SETMASK, &maskBefore, nullptr); }
+
+  /// The mask that the thread had, and has again after this.
+  const sigset_t& before() const { return maskBefore; }
 
  private:
-  sigset_t before{};
+  sigset_t maskBefore{};
 };
 
 }  // namespace posix
