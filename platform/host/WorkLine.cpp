@@ -108,8 +108,8 @@ class WorkLine {
     gIsShown = true;
   }
 
-  /// Has a signal do what it does by default, at once: it never waits for a terminal that Ctrl-S has
-  /// stopped, nor for a thread that does.
+  /// Has a signal do what it does by default, at once: it never waits for a terminal that Ctrl-S
+  /// has stopped, nor for a thread that does.
   void takeSignal() const {
     signalfd_siginfo taken{};
     if (::read(signals.get(), &taken, sizeof taken) != sizeof taken) return;
