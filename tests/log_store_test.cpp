@@ -112,7 +112,6 @@ TEST(RecordedLog, DeliversWhatIsWholeAndTellsDamage) {
                                              {'F', binary("MESSAGE", kForged)},
                                              {'O', binary("OTHER", kForged)},
                                              {'S', binary("MESSAGE", "xyz", 2)},
-                                             {'C', binary("MESSAGE", "", (32 << 20) + 1)},
                                              {'L', binary("X", "", ~0ULL)}};
   forEachRow("damage", 2, [&parts](const Row& row) {
     std::string log;

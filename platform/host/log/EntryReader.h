@@ -37,8 +37,21 @@ class EntryReader {
   void callBeforeWaiting(std::function<void()> call) { beforeWaiting = std::move(call); }
 
  protected:
+  /// Appends `piece` to a value of the current entry. Throws `DamagedLog` for too many bytes.
+  void keep(Field field, std::string_view piece) {
+    current.append(field, piece);
+    if (current[field].size() > kMaxField) damagedBy("a field is too long");
+    if (current.size() > kMaxFields) damagedBy("an entry is too long");
+  }
+
+  [[noreturn]] void damagedBy(const char* what) const { throw DamagedLog(place() + ": " + what); }
+
   LogEntry current;
   std::function<void()> beforeWaiting = [] {};
+
+ private:
+  /// Where in the log the reader is, for the texts of `DamagedLog`.
+  virtual std::string place() const = 0;
 };
 
 }  // namespace host

@@ -4,7 +4,6 @@
 #include <sys/stat.h>
 
 #include <algorithm>
-#include <array>
 #include <cerrno>
 #include <new>
 #include <span>
@@ -109,8 +108,6 @@ struct NamedValue {
   std::size_t nameSize;
 };
 
-constexpr std::size_t kHugeEntry = std::size_t{64} << 10;
-
 constexpr std::uint64_t kBlockSize = 512;  // of st_blocks, see stat(3type)
 
 /// What is uncompressed of a value: enough to see that it is too long.
@@ -169,9 +166,7 @@ class JournalReader final : public EntryReader {
 
   /// False when the entry has no date that an event can have.
   bool readEntry() {
-    if (size > kHugeEntry) decltype(copies)().swap(copies);  // it is not held on to
-    current = LogEntry();
-    size = 0;
+    current.clear();
     std::uint64_t date = 0;
     journal.check(lib().sd_journal_get_realtime_usec(journal.get(), &date));
     if (date > kMaxDate) return false;
@@ -186,16 +181,11 @@ class JournalReader final : public EntryReader {
 
   void take(const NamedValue& given) {
     const Field field = fieldCalled(given.name());
-    if (field == Field::none || current.has(field)) return;
-    const std::string_view value = given.value();
-    size += value.size();
-    if (value.size() > kMaxField) damagedBy("a field is too long");
-    if (size > kMaxFields) damagedBy("an entry is too long");
-    current.at(field) = copies[static_cast<std::size_t>(field)].assign(value);
+    if (field != Field::none && !current.has(field)) keep(field, given.value());
   }
 
-  [[noreturn]] void damagedBy(const char* what) const {
-    throw DamagedLog("entry of " + std::to_string(current.microseconds) + " us: " + what);
+  std::string place() const override {
+    return "entry of " + std::to_string(current.microseconds) + " us";
   }
 
   // What the index is asked for: the values of the fields that a process name or an image's path
@@ -224,7 +214,7 @@ class JournalReader final : public EntryReader {
          {Field::comm, Field::syslogIdentifier, Field::exe, Field::senderPath}) {
       for (const std::string& value : uniqueValues(field)) {
         LogEntry entry;
-        entry.at(field) = value;
+        entry.append(field, value);
         const bool passes =
             filter.passes(entry) || (field == Field::comm && passesWhole(entry, images));
         if (passes) matches.push_back(std::string(nameOf(field)) + '=' + value);
@@ -234,11 +224,11 @@ class JournalReader final : public EntryReader {
   }
 
   /// Whether one of `images` makes a longer name of the process of `entry`, one that passes.
-  bool passesWhole(LogEntry& entry, const std::vector<std::string>& images) const {
-    const std::string cut = processOf(entry);
+  bool passesWhole(const LogEntry& entry, const std::vector<std::string>& images) const {
     return std::ranges::any_of(images, [&](const std::string& image) {
-      entry.at(Field::exe) = image;
-      return processOf(entry) != cut && filter.passes(entry);
+      LogEntry whole = entry;
+      whole.append(Field::exe, image);
+      return processOf(whole) != processOf(entry) && filter.passes(whole);
     });
   }
 
@@ -264,8 +254,6 @@ class JournalReader final : public EntryReader {
   bool begun = false;
   bool mayHaveMore = true;
   unsigned entries = 0;
-  std::size_t size = 0;  ///< of the values of the current entry
-  std::array<std::string, static_cast<std::size_t>(Field::none)> copies;
 };
 
 }  // namespace

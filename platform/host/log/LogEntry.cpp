@@ -33,4 +33,18 @@ Field fieldCalled(std::string_view name) {
 
 std::string_view nameOf(Field field) { return kNames[static_cast<std::size_t>(field)]; }
 
+void LogEntry::append(Field field, std::string_view piece) {
+  Value& value = values[static_cast<std::size_t>(field)];
+  if (!value.isThere) value = {true, bytes.size(), 0};
+  bytes += piece;
+  value.size += piece.size();
+}
+
+void LogEntry::clear() {
+  constexpr std::size_t kHuge = std::size_t{256} << 10;
+  values = {};
+  bytes.clear();
+  if (bytes.capacity() > kHuge) bytes.shrink_to_fit();
+}
+
 }  // namespace host

@@ -3,6 +3,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <string>
 #include <string_view>
 
 namespace host {
@@ -39,22 +40,38 @@ inline constexpr std::size_t kMaxField = std::size_t{32} << 20;    ///< the byte
 inline constexpr std::size_t kMaxFields = std::size_t{64} << 20;   ///< those of all together
 inline constexpr std::int64_t kMaxDate = 253'402'300'799'999'999;  ///< the end of the year 9999
 
-/// One entry of a log: the first value of each field, as it stood there. The bytes may be any.
-struct LogEntry {
+/// One entry of a log: its date, and the first value of each field. The bytes may be any.
+class LogEntry {
+ public:
   /// The date: microseconds since 1970, at most kMaxDate.
   std::int64_t microseconds = 0;
 
-  bool has(Field field) const { return at(field).data() != nullptr; }
-  std::string_view operator[](Field field) const { return at(field); }
+  bool has(Field field) const { return at(field).isThere; }
 
-  const std::string_view& at(Field field) const { return values[static_cast<std::size_t>(field)]; }
-  std::string_view& at(Field field) { return values[static_cast<std::size_t>(field)]; }
+  /// The value of `field`, empty where the entry does not have it. Valid until the entry changes.
+  std::string_view operator[](Field field) const {
+    return std::string_view(bytes).substr(at(field).start, at(field).size);
+  }
 
-  /// One value for each field; a field that the entry does not have is one without data.
-  using Values = std::array<std::string_view, static_cast<std::size_t>(Field::none)>;
+  /// The bytes of all values.
+  std::size_t size() const { return bytes.size(); }
+
+  /// Appends `piece` to the value of `field`, which is the last that the entry got, or a new one.
+  void append(Field field, std::string_view piece);
+
+  /// Makes it one without fields. Gives back the memory of a huge one.
+  void clear();
 
  private:
-  Values values;
+  struct Value {
+    bool isThere = false;
+    std::size_t start = 0;
+    std::size_t size = 0;
+  };
+  const Value& at(Field field) const { return values[static_cast<std::size_t>(field)]; }
+
+  std::array<Value, static_cast<std::size_t>(Field::none)> values;
+  std::string bytes;  ///< of the values, one after the other
 };
 
 }  // namespace host

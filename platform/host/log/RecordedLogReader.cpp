@@ -1,6 +1,6 @@
 #include "platform/host/log/RecordedLogReader.h"
 
-#include <algorithm>
+#include <array>
 #include <charconv>
 #include <cstring>
 #include <utility>
@@ -38,18 +38,13 @@ const char* RecordedLogReader::endOfLine() const {
 
 bool RecordedLogReader::next() {
   do {
-    startEntry();
-    if (!readEntry()) return false;
+    current.clear();
+    begun = complete = false;
+    while (!complete) {
+      if (!readField()) return false;
+    }
   } while (!readDate());
   return true;
-}
-
-void RecordedLogReader::startEntry() {
-  current = LogEntry();
-  begun = complete = false;
-  // What a huge field has left is not held on to, as a text that is assigned an empty one would.
-  if (kept > kBuffer) decltype(copies)().swap(copies);
-  kept = 0;
 }
 
 bool RecordedLogReader::readDate() {
@@ -60,13 +55,6 @@ bool RecordedLogReader::readDate() {
          current.microseconds <= kMaxDate;
 }
 
-bool RecordedLogReader::readEntry() {
-  while (!complete) {
-    if (!readField()) return false;
-  }
-  return true;
-}
-
 bool RecordedLogReader::readField() {
   // The end of the line first: the next field can be looked at before this one is understood.
   const char* const lineEnd = endOfLine();
@@ -74,15 +62,11 @@ bool RecordedLogReader::readField() {
   const auto size = static_cast<std::size_t>(nameEnd - position);
   if (size > kMaxName) damagedBy("a field name is too long");
   if (nameEnd == limit) return refill();  // and come back
-  if (*nameEnd == '=' && size > 0) {
+  if (size > 0 && (*nameEnd == '=' || *nameEnd == '\n')) {
     const Field field = wanted({position, size});
+    begun = true;
     position = nameEnd + 1;
-    return readText(field, lineEnd);
-  }
-  if (*nameEnd == '\n' && size > 0) {
-    const Field field = wanted({position, size});
-    position = nameEnd + 1;
-    return readBinary(field);
+    return *nameEnd == '=' ? readText(field, lineEnd) : readBinary(field);
   }
   if (*nameEnd == '\n') {
     complete = begun;
@@ -92,8 +76,7 @@ bool RecordedLogReader::readField() {
   return skipSeparator(lineEnd);
 }
 
-Field RecordedLogReader::wanted(std::string_view name) {
-  begun = true;
+Field RecordedLogReader::wanted(std::string_view name) const {
   const Field field = fieldCalled(name);
   return field != Field::none && !current.has(field) ? field : Field::none;
 }
@@ -111,17 +94,11 @@ bool RecordedLogReader::skipSeparator(const char* lineEnd) {
 }
 
 bool RecordedLogReader::readText(Field field, const char* lineEnd) {
-  if (lineEnd != limit) {
-    take(field, static_cast<std::size_t>(lineEnd - position));
-  } else {
-    startPieces(field);
-    for (; lineEnd == limit; lineEnd = endOfLine()) {
-      takePiece(field, rest());
-      if (!refill()) return false;
-    }
-    takePiece(field, static_cast<std::size_t>(lineEnd - position));
-    endPieces(field);
+  for (; lineEnd == limit; lineEnd = endOfLine()) {
+    take(field, rest());
+    if (!refill()) return false;
   }
+  take(field, static_cast<std::size_t>(lineEnd - position));
   ++position;
   return true;
 }
@@ -129,19 +106,12 @@ bool RecordedLogReader::readText(Field field, const char* lineEnd) {
 bool RecordedLogReader::readBinary(Field field) {
   std::uint64_t length = 0;
   if (!readLength(length)) return false;
-  if (field != Field::none && length > kMaxField) damagedBy("a field is too long");
-  if (length < rest()) {
-    take(field, static_cast<std::size_t>(length));
-  } else {
-    startPieces(field);
-    while (length >= rest()) {
-      length -= rest();
-      takePiece(field, rest());
-      if (!refill()) return false;
-    }
-    takePiece(field, static_cast<std::size_t>(length));
-    endPieces(field);
+  while (length >= rest()) {
+    length -= rest();
+    take(field, rest());
+    if (!refill()) return false;
   }
+  take(field, static_cast<std::size_t>(length));
   if (*position != '\n') damagedBy("no newline after a binary field");
   ++position;
   return true;
@@ -158,37 +128,11 @@ bool RecordedLogReader::readLength(std::uint64_t& length) {
 }
 
 void RecordedLogReader::take(Field field, std::size_t size) {
-  if (field != Field::none) current.at(field) = {position, size};
-  count(field, size);
+  if (field != Field::none) keep(field, {position, size});
   position += size;
-}
-
-void RecordedLogReader::startPieces(Field field) {
-  pieces = 0;
-  if (field != Field::none) copy(field).clear();
-}
-
-void RecordedLogReader::takePiece(Field field, std::size_t size) {
-  pieces += size;
-  if (field != Field::none) {
-    if (pieces > kMaxField) damagedBy("a field is too long");
-    copy(field).append(position, size);
-  }
-  count(field, size);
-  position += size;
-}
-
-void RecordedLogReader::count(Field field, std::size_t size) {
-  if (field != Field::none) kept += size;
-  if (kept > kMaxFields) damagedBy("an entry is too long");
-}
-
-void RecordedLogReader::endPieces(Field field) {
-  if (field != Field::none) current.at(field) = copy(field);
 }
 
 bool RecordedLogReader::refill() {
-  leaveBuffer();
   const std::size_t left = rest();
   consumed += static_cast<std::uint64_t>(position - buffer.data());
   std::memmove(buffer.data(), position, left);
@@ -203,17 +147,9 @@ bool RecordedLogReader::refill() {
   return false;
 }
 
-void RecordedLogReader::leaveBuffer() {
-  for (std::size_t i = 0; i < copies.size(); ++i) {
-    std::string_view& value = current.at(static_cast<Field>(i));
-    if (value.data() == nullptr || value.data() == copies[i].data()) continue;
-    value = copies[i].assign(value);
-  }
-}
-
-void RecordedLogReader::damagedBy(const char* what) const {
+std::string RecordedLogReader::place() const {
   const std::uint64_t offset = consumed + static_cast<std::uint64_t>(position - buffer.data());
-  throw DamagedLog("damaged at byte " + std::to_string(offset) + ": " + what);
+  return "damaged at byte " + std::to_string(offset);
 }
 
 }  // namespace host

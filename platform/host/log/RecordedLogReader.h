@@ -1,6 +1,5 @@
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
@@ -25,7 +24,7 @@ namespace host {
 /// Skipped silently: an entry without a valid date and, between entries, empty lines and lines that
 /// start with "-- ", which journalctl writes at a reboot.
 ///
-/// Memory is one buffer, and copies of those wanted fields that do not fit into it.
+/// Memory is one buffer, and the wanted fields of one entry.
 class RecordedLogReader final : public EntryReader {
  public:
   static constexpr std::size_t kBuffer = std::size_t{256} << 10;
@@ -41,33 +40,22 @@ class RecordedLogReader final : public EntryReader {
   bool next() override;
 
  private:
-  void startEntry();
-  bool readEntry();
   bool readDate();
 
-  // Each of these is false when nothing more is to be read. `field` is none
-  // where the value is not wanted; `lineEnd` is `limit` where the line continues after it.
+  // Each of these is false when nothing more is to be read. `field` is none where the value is not
+  // wanted; `lineEnd` is `limit` where the line continues after it.
   bool readField();
   bool skipSeparator(const char* lineEnd);
   bool readText(Field field, const char* lineEnd);
   bool readBinary(Field field);
   bool readLength(std::uint64_t& length);
   bool refill();
-  [[noreturn]] void damagedBy(const char* what) const;
 
-  void count(Field field, std::size_t size);
-
-  // A value is taken where it lies, or piece by piece into a copy when the buffer cannot hold it.
   void take(Field field, std::size_t size);
-  void startPieces(Field field);
-  void takePiece(Field field, std::size_t size);
-  void endPieces(Field field);
-  void leaveBuffer();
-
+  std::string place() const override;
   const char* endOfLine() const;
-  Field wanted(std::string_view name);
+  Field wanted(std::string_view name) const;
   std::size_t rest() const { return static_cast<std::size_t>(limit - position); }
-  std::string& copy(Field field) { return copies[static_cast<std::size_t>(field)]; }
 
   const ReadBytes readBytes;
   std::vector<char> buffer;    ///< of kBuffer bytes, and a newline after those that it holds
@@ -75,11 +63,8 @@ class RecordedLogReader final : public EntryReader {
   const char* limit;           ///< the end of what the buffer holds
   std::uint64_t consumed = 0;  ///< bytes of the log before the buffer
 
-  bool begun = false;      ///< a field of the current entry has been read, or begun
-  bool complete = false;   ///< the current entry is whole
-  std::size_t pieces = 0;  ///< bytes taken of the current field
-  std::size_t kept = 0;    ///< bytes of the wanted fields of the current entry
-  std::array<std::string, static_cast<std::size_t>(Field::none)> copies;
+  bool begun = false;     ///< a field of the current entry has been read, or begun
+  bool complete = false;  ///< the current entry is whole
 };
 
 }  // namespace host
