@@ -95,17 +95,10 @@ void AppendNumber(std::string& text, Number number, int base = 10, std::size_t l
   text.append(digits, length);
 }
 
-/// "DATE 0xTHREAD 0xACTIVITY PID PROCESS(SENDER):SUBSYSTEM [CATEGORY] MESSAGE\n", the date being
-/// the wall-clock time of the device that logged.
-std::string FormatLine(const OSLogEventProxy& event) {
-  constexpr std::size_t kMostForDateAndNumbers = 100;
-  const std::string_view texts[] = {
-      event.process(),  "(",  event.sender(),          "):", event.subsystem(), " [",
-      event.category(), "] ", event.composedMessage(), "\n"};
-  std::size_t size = kMostForDateAndNumbers;
-  for (const auto text : texts) size += text.size();
-  std::string line;
-  line.reserve(size);
+/// Makes `line` "DATE 0xTHREAD 0xACTIVITY PID PROCESS(SENDER):SUBSYSTEM [CATEGORY] MESSAGE\n", the
+/// date being the wall-clock time of the device that logged.
+void FormatLine(const OSLogEventProxy& event, std::string& line) {
+  line.clear();
   const auto date = event.date();
   date.addingSeconds(event.timeZone().secondsFromGMT(date)).appendDescription(line);
   line.append(" 0x");
@@ -114,15 +107,17 @@ std::string FormatLine(const OSLogEventProxy& event) {
   AppendNumber(line, event.activityIdentifier(), 16);
   line.push_back(' ');
   AppendNumber(line, event.processIdentifier());
-  line.push_back(' ');
-  for (const auto text : texts) line.append(text);
-  return line;
+  line.append(" ").append(event.process()).append("(").append(event.sender());
+  line.append("):").append(event.subsystem()).append(" [").append(event.category());
+  line.append("] ").append(event.composedMessage()).append("\n");
 }
 
-/// Appends the line of `event`. Returns why that was not possible, if so; the file is then closed.
-std::error_code AppendLine(LineFile& file, const OSLogEventProxy& event) {
+/// Appends the line of `event`, made in `line`. Returns why that was not possible, if so; the file
+/// is then closed.
+std::error_code AppendLine(LineFile& file, const OSLogEventProxy& event, std::string& line) {
   try {
-    return file.append(FormatLine(event));
+    FormatLine(event, line);
+    return file.append(line);
   } catch (const std::bad_alloc&) {
     file.fail();
     return std::make_error_code(std::errc::not_enough_memory);
@@ -132,13 +127,14 @@ std::error_code AppendLine(LineFile& file, const OSLogEventProxy& event) {
 void SetHandlers(const StreamHandle& stream, const std::shared_ptr<LineFile>& file,
                  const std::string& path, const dispatch::group& group) {
   const std::weak_ptr<OSLogEventStream> weakStream = stream;  // the stream owns its handlers
-  stream->setEventHandler([file, path, weakStream](const OSLogEventProxy& event) {
-    if (event.type() != kOSLogEventTypeLogMessage) return;
-    const auto failure = AppendLine(*file, event);
-    if (!failure) return;
-    platform::logError("Failed to write file: " + path + ": " + failure.message());
-    if (const auto failing = weakStream.lock()) failing->invalidate();
-  });
+  stream->setEventHandler(
+      [file, path, weakStream, line = std::string()](const OSLogEventProxy& event) mutable {
+        if (event.type() != kOSLogEventTypeLogMessage) return;
+        const auto failure = AppendLine(*file, event, line);
+        if (!failure) return;
+        platform::logError("Failed to write file: " + path + ": " + failure.message());
+        if (const auto failing = weakStream.lock()) failing->invalidate();
+      });
   stream->setInvalidationHandler([group](unsigned long reason, const OSLogEventStreamPosition&) {
     try {
       if (reason != kOSLogEventStreamEndOfLog) {
