@@ -22,39 +22,6 @@
 namespace host {
 namespace {
 
-/// The bytes that a descriptor gives: of a file, from its start, whoever else reads it.
-class DescriptorBytes {
- public:
-  /// `name` is for errors.
-  DescriptorBytes(std::string name, int opened, const StopSignal& signal)
-      : path(std::move(name)),
-        descriptor(opened),
-        stop(signal),
-        isFile(::lseek(opened, 0, SEEK_CUR) >= 0) {}
-
-  std::optional<std::size_t> operator()(char* buffer, std::size_t size) {
-    while (stop.waitReadable(descriptor)) {
-      const ssize_t count =
-          isFile ? ::pread(descriptor, buffer, size, offset) : ::read(descriptor, buffer, size);
-      if (count >= 0) {
-        offset += count;
-        return static_cast<std::size_t>(count);
-      }
-      if (errno != EINTR && errno != EAGAIN) {
-        throw std::system_error(errno, std::generic_category(), path);
-      }
-    }
-    return std::nullopt;
-  }
-
- private:
-  std::string path;
-  int descriptor;
-  const StopSignal& stop;
-  bool isFile;
-  off_t offset = 0;
-};
-
 class RecordedSource final : public LogSource {
  public:
   RecordedSource(std::string name, posix::Descriptor opened)
@@ -62,10 +29,31 @@ class RecordedSource final : public LogSource {
 
   std::unique_ptr<EntryReader> open(OSLogDate, const EventFilter&,
                                     const StopSignal& stop) const override {
-    return std::make_unique<RecordedLogReader>(DescriptorBytes(path, descriptor.get(), stop));
+    const auto readBytes = [this, &stop, offset = off_t{0}](char* buffer,
+                                                            std::size_t size) mutable {
+      const auto count = read(buffer, size, offset, stop);
+      offset += static_cast<off_t>(count.value_or(0));
+      return count;
+    };
+    return std::make_unique<RecordedLogReader>(readBytes);
   }
 
  private:
+  /// Reads what a file has at `offset`, whoever else reads it; of anything else, what comes next.
+  /// Nothing when stopped.
+  std::optional<std::size_t> read(char* buffer, std::size_t size, off_t offset,
+                                  const StopSignal& stop) const {
+    while (stop.waitReadable(descriptor.get())) {
+      ssize_t count = ::pread(descriptor.get(), buffer, size, offset);
+      if (count < 0 && errno == ESPIPE) count = ::read(descriptor.get(), buffer, size);
+      if (count >= 0) return static_cast<std::size_t>(count);
+      if (errno != EINTR && errno != EAGAIN) {
+        throw std::system_error(errno, std::generic_category(), path);
+      }
+    }
+    return std::nullopt;
+  }
+
   std::string path;
   posix::Descriptor descriptor;
 };
