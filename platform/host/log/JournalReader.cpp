@@ -10,6 +10,7 @@
 #include <stdexcept>
 #include <string>
 #include <system_error>
+#include <utility>
 #include <vector>
 
 #include "platform/host/log/JournalFaults.h"
@@ -94,19 +95,12 @@ void checkOpens(std::span<const JournalFile> files, const std::string& name) try
 
 void checkAlone(const JournalFile& file) { checkOpens({&file, 1}, file.path.string() + ": "); }
 
-/// A field as the library gives it, "NAME=value".
-struct NamedValue {
-  NamedValue(const void* data, std::size_t size)
-      : whole(static_cast<const char*>(data), size), nameSize(whole.find('=')) {}
-
-  std::string_view name() const { return whole.substr(0, nameSize); }
-  std::string_view value() const {
-    return nameSize == std::string_view::npos ? "" : whole.substr(nameSize + 1);
-  }
-
-  std::string_view whole;
-  std::size_t nameSize;
-};
+/// The name and the value of a field, which the library gives as "NAME=value".
+std::pair<std::string_view, std::string_view> nameAndValue(const void* data, std::size_t size) {
+  const std::string_view whole(static_cast<const char*>(data), size);
+  const std::size_t nameSize = std::min(whole.find('='), size);
+  return {whole.substr(0, nameSize), whole.substr(std::min(nameSize + 1, size))};
+}
 
 constexpr std::uint64_t kBlockSize = 512;  // of st_blocks, see stat(3type)
 
@@ -174,14 +168,11 @@ class JournalReader final : public EntryReader {
     const void* data = nullptr;
     std::size_t length = 0;
     while (journal.check(lib().sd_journal_enumerate_data(journal.get(), &data, &length)) > 0) {
-      take(NamedValue(data, length));
+      const auto [name, value] = nameAndValue(data, length);
+      const Field field = fieldCalled(name);
+      if (field != Field::none && !current.has(field)) keep(field, value);
     }
     return true;
-  }
-
-  void take(const NamedValue& given) {
-    const Field field = fieldCalled(given.name());
-    if (field != Field::none && !current.has(field)) keep(field, given.value());
   }
 
   std::string place() const override {
@@ -241,7 +232,7 @@ class JournalReader final : public EntryReader {
     std::size_t length = 0;
     while (!stop.raised() &&
            journal.check(lib().sd_journal_enumerate_unique(journal.get(), &data, &length)) > 0) {
-      values.emplace_back(NamedValue(data, length).value());
+      values.emplace_back(nameAndValue(data, length).second);
     }
     return values;
   }
