@@ -56,18 +56,6 @@ extern "C" void onEnding(int signal) {
   errno = errorBefore;
 }
 
-/// Sets the calling thread's mask of blocked signals while this lives.
-class SignalMask {
- public:
-  explicit SignalMask(const sigset_t& blocked) { pthread_sigmask(SIG_SETMASK, &blocked, &before); }
-  SignalMask(const SignalMask&) = delete;
-  SignalMask& operator=(const SignalMask&) = delete;
-  ~SignalMask() { pthread_sigmask(SIG_SETMASK, &before, nullptr); }
-
- private:
-  sigset_t before{};
-};
-
 /// The settings for editing, but for what the user has chosen: keys come one at a time and as they
 /// are, and Ctrl-C is one of them. Ctrl-Z and Ctrl-\ are signals still.
 termios forEditing(termios settings) {
@@ -95,13 +83,11 @@ std::vector<int> endingSignals() {
 }
 
 void takeEffect(int signal) {
-  sigset_t only;
-  sigset_t before;
-  sigemptyset(&only);
-  sigaddset(&only, signal);
+  sigset_t others;
+  sigfillset(&others);
+  sigdelset(&others, signal);
   raise(signal);
-  pthread_sigmask(SIG_UNBLOCK, &only, &before);  // here the process ends, or stops and goes on
-  pthread_sigmask(SIG_SETMASK, &before, nullptr);
+  const posix::SignalMask now(others);  // here the process ends, or stops and goes on
 }
 
 bool hasTerminal(int descriptor) {
@@ -142,7 +128,7 @@ TerminalSession::~TerminalSession() {
 /// Takes the terminal. In the background that stops the process until it is in the foreground.
 void TerminalSession::enter() {
   {
-    const SignalMask now(blocked.before());
+    const posix::SignalMask now(blocked.before());
     while (tcdrain(STDIN_FILENO) != 0 && errno == EINTR) {
     }
   }
@@ -176,7 +162,7 @@ TerminalSession::Event TerminalSession::wait(int milliseconds) {
 
 std::optional<char> TerminalSession::read() {
   constexpr char kCtrlD = 4;
-  const SignalMask now(blocked.before());
+  const posix::SignalMask now(blocked.before());
   char byte = 0;
   if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return std::nullopt;
   const bool isAhead = typedAhead > 0;
@@ -185,7 +171,7 @@ std::optional<char> TerminalSession::read() {
 }
 
 void TerminalSession::write(std::string_view text) {
-  const SignalMask now(blocked.before());
+  const posix::SignalMask now(blocked.before());
   std::ignore = posix::writeAll(STDOUT_FILENO, text);
 }
 

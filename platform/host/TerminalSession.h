@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include "platform/posix/SignalsBlocked.h"
+#include "platform/posix/SignalMask.h"
 
 namespace host {
 
@@ -76,7 +76,7 @@ class TerminalSession {
   void enter();
 
   const std::vector<int> ending = endingSignals();
-  const posix::SignalsBlocked blocked;
+  const posix::SignalMask blocked;
   int typedAhead = 0;  // bytes
 };
 

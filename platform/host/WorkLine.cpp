@@ -18,7 +18,7 @@
 
 #include "platform/host/TerminalSession.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/SignalsBlocked.h"
+#include "platform/posix/SignalMask.h"
 #include "platform/terminal.h"
 
 namespace {
@@ -120,7 +120,7 @@ class WorkLine {
 
   const steady_clock::time_point begin = steady_clock::now();
   const std::size_t linesBefore = posix::linesWritten();
-  const posix::SignalsBlocked here;  // and on the thread
+  const posix::SignalMask here;  // and on the thread
   sigset_t ending{};
   posix::Descriptor signals;
   posix::Descriptor over;

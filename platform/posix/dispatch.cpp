@@ -10,7 +10,7 @@
 #include <new>
 #include <thread>
 
-#include "platform/posix/SignalsBlocked.h"
+#include "platform/posix/SignalMask.h"
 
 namespace dispatch {
 
@@ -89,7 +89,7 @@ struct queue::Worker {
 
 queue::queue(std::string label) {
   const auto shared = std::make_shared<Worker>();
-  const posix::SignalsBlocked onTheThread;
+  const posix::SignalMask onTheThread;
   std::thread thread([shared] { shared->run(); });
   constexpr std::size_t kLongestThreadName = 15;  // pthread_setname_np(3)
   label.resize(std::min(label.size(), kLongestThreadName));

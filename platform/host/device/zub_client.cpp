@@ -13,7 +13,7 @@
 #include "platform/host/device/Device.h"
 #include "platform/host/device/Requests.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/SignalsBlocked.h"
+#include "platform/posix/SignalMask.h"
 
 namespace zub {
 
@@ -113,7 +113,7 @@ void startServer(const std::shared_ptr<Manager>& manager) {
   for (; next != steps.end() && next->at.count() == 0; ++next) manager->enterState(next->state);
   steps.erase(steps.begin(), next);
   if (steps.empty()) return;
-  const posix::SignalsBlocked onTheThread;
+  const posix::SignalMask onTheThread;
   std::thread([manager, start, steps = std::move(steps)]() mutable {
     for (auto& step : steps) {
       std::this_thread::sleep_until(start + step.at);

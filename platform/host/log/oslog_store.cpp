@@ -14,7 +14,7 @@
 #include "platform/host/log/ReadAhead.h"
 #include "platform/host/log/StopSignal.h"
 #include "platform/host/log/StreamEnd.h"
-#include "platform/posix/SignalsBlocked.h"
+#include "platform/posix/SignalMask.h"
 #include "platform/system.h"
 
 namespace {
@@ -109,7 +109,7 @@ class HostStream final : public OSLogEventStream {
     // Shared, so that it is still there when no thread can be had.
     const auto handed = std::make_shared<Delivery>();
     std::swap(*handed, delivery);
-    const posix::SignalsBlocked onTheThread;
+    const posix::SignalMask onTheThread;
     try {
       std::thread([handed] { run(std::move(*handed)); }).detach();
     } catch (const std::exception& failure) {

@@ -1,0 +1,37 @@
+#pragma once
+
+#include <csignal>
+
+namespace posix {
+
+/// Gives the calling thread another mask of blocked signals while this lives, and the threads that
+/// it starts meanwhile for good.
+class SignalMask {
+ public:
+  /// Blocks all signals but those that report a fault of the thread itself.
+  SignalMask() {
+    sigset_t sent;
+    sigfillset(&sent);
+    for (const int fault : {SIGSEGV, SIGBUS, SIGFPE, SIGILL, SIGTRAP, SIGSYS}) {
+      sigdelset(&sent, fault);
+    }
+    pthread_sigmask(SIG_BLOCK, &sent, &maskBefore);
+  }
+
+  /// Blocks `blocked`, and no others.
+  explicit SignalMask(const sigset_t& blocked) {
+    pthread_sigmask(SIG_SETMASK, &blocked, &maskBefore);
+  }
+
+  SignalMask(const SignalMask&) = delete;
+  SignalMask& operator=(const SignalMask&) = delete;
+  ~SignalMask() { pthread_sigmask(SIG_SETMASK, &maskBefore, nullptr); }
+
+  /// The mask that the thread had, and has again after this.
+  const sigset_t& before() const { return maskBefore; }
+
+ private:
+  sigset_t maskBefore{};
+};
+
+}  // namespace posix
