@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <map>
+#include <span>
 #include <string_view>
 #include <utility>
 #include <vector>
@@ -74,33 +75,250 @@ class Editor {
       : memory(memory), prompt(prompt), complete(complete), place(memory.history.size()) {}
 
   /// True for a line, false at the end of the input.
-  bool read(std::string& result);
+  bool read(std::string& result) {
+    takePasted();
+    draw();
+    while (!isLine) {
+      const auto key = readKey();
+      if (key.empty()) return false;
+      press(key);
+    }
+    result = line.text();
+    return *isLine;
+  }
 
  private:
   struct Binding {
     std::string_view keys;  // as terminals send them, separated by blanks
     void (*act)(Editor&);
   };
-  static const Binding kBindings[];
 
-  std::string readKey();
-  bool readByte(std::string& key, int milliseconds);
-  void draw();
-  void press(const std::string& key);
-  void accept();
-  void giveUp();
-  void eraseOrEnd();
-  void clearScreen();
-  void kill(EditedLine::Motion motion);
-  void paste();
-  void takePasted();
-  const std::string& lineAt(std::size_t index) const;
-  void show(std::size_t newPlace);
-  void search();
-  bool followSearch(const std::string& key);
-  void find(std::size_t end);
-  void completeWord();
-  void list(const Candidates& candidates);
+  /// Reads all that one key sends; nothing at the end of the input.
+  std::string readKey() {
+    std::string key;
+    if (!readByte(key, -1) || key != "\033") return key;
+    while (!isWhole(key) && readByte(key, kRestOfSequence)) {
+      if (key == "\033\033") key.pop_back();  // Alt with a key that starts with an escape itself
+    }
+    if (key.starts_with("\033O")) key[1] = '[';  // what a terminal sends in its application mode
+    return key;
+  }
+
+  /// Adds a byte to `key`. False at the end of the input, or when none comes within `milliseconds`.
+  /// Before it waits, the screen shows what has been typed.
+  bool readByte(std::string& key, int milliseconds) {
+    for (;;) {
+      auto event = session.wait(0);
+      if (event == TerminalSession::Event::timeout) {
+        draw();
+        event = session.wait(milliseconds);
+      }
+      switch (event) {
+        case TerminalSession::Event::input: {
+          const auto byte = session.read();
+          if (byte) key += *byte;
+          return byte.has_value();
+        }
+        case TerminalSession::Event::timeout:
+          return false;
+        case TerminalSession::Event::resized:
+          display.clear();
+          break;
+        case TerminalSession::Event::continued:
+          display.forget();
+          break;
+      }
+    }
+  }
+
+  void draw() {
+    const auto shown = wanted ? "(search)`" + wanted->text() + "': " : prompt;
+    display.draw(shown + line.text(), shown.size() + line.beforeCursor().size());
+  }
+
+  void press(const std::string& key) {
+    hadKilled = std::exchange(hasKilled, false);
+    if (followSearch(key)) return;
+    if (isText(key)) return line.insert(key);
+    for (const auto& [keys, act] : bindings()) {
+      if (isOneOf(keys, key)) return act(*this);
+    }
+  }
+
+  /// What each key does that is no text.
+  static std::span<const Binding> bindings() {
+    static constexpr Binding kBindings[] = {
+        {"\x01 \033[H \033[1~ \033[7~", [](Editor& e) { e.line.move(toStart); }},
+        {"\x05 \033[F \033[4~ \033[8~", [](Editor& e) { e.line.move(toEnd); }},
+        {"\x02 \033[D \033[1;2D", [](Editor& e) { e.line.move(left); }},
+        {"\x06 \033[C \033[1;2C", [](Editor& e) { e.line.move(right); }},
+        {"\033b \033[1;5D \033[1;3D", [](Editor& e) { e.line.move(wordLeft); }},
+        {"\033f \033[1;5C \033[1;3C", [](Editor& e) { e.line.move(wordRight); }},
+        {kBackspace, [](Editor& e) { e.line.erase(left); }},
+        {"\033[3~", [](Editor& e) { e.line.erase(right); }},
+        {"\x0B", [](Editor& e) { e.kill(toEnd); }},
+        {"\x15", [](Editor& e) { e.kill(toStart); }},
+        {"\x17 \033\x7F \033\x08", [](Editor& e) { e.kill(wordLeft); }},
+        {"\033d \033[3;5~ \033[3;3~", [](Editor& e) { e.kill(wordRight); }},
+        {"\x19", [](Editor& e) { e.line.insert(e.memory.killed); }},
+        {"\x14", [](Editor& e) { e.line.transpose(); }},
+        {"\x10 \033[A", [](Editor& e) { e.show(e.place > 0 ? e.place - 1 : 0); }},
+        {"\x0E \033[B", [](Editor& e) { e.show(std::min(e.place + 1, e.memory.history.size())); }},
+        {kCtrlR, [](Editor& e) { e.search(); }},
+        {"\t", [](Editor& e) { e.completeWord(); }},
+        {"\x0C", [](Editor& e) { e.clearScreen(); }},
+        {"\r \n", [](Editor& e) { e.accept(); }},
+        {"\x03", [](Editor& e) { e.giveUp(); }},
+        {"\x04", [](Editor& e) { e.eraseOrEnd(); }},
+        {"\033[200~", [](Editor& e) { e.paste(); }},
+    };
+    return kBindings;
+  }
+
+  void accept() {
+    draw();
+    display.append("\r\n");
+    isLine = true;
+    auto& history = memory.history;
+    const bool isBlank = line.text().find_first_not_of(kWhiteSpace) == std::string::npos;
+    if (isBlank || (!history.empty() && history.back() == line.text())) return;
+    if (history.size() == kLongestHistory) history.erase(history.begin());
+    history.push_back(line.text());
+  }
+
+  /// Ctrl-C. The lines of a paste that are still to come go as well.
+  void giveUp() {
+    draw();
+    display.append("^C\r\n");
+    line.set("");
+    memory.pasted.clear();
+    isLine = true;
+  }
+
+  void eraseOrEnd() {
+    if (line.text().empty()) isLine = false;
+    line.erase(right);
+  }
+
+  void clearScreen() {
+    session.write("\033[H\033[2J");
+    display.forget();
+  }
+
+  /// Erases for Ctrl-Y: what several keys in a row erase, as one text.
+  void kill(EditedLine::Motion motion) {
+    const bool isToLeft = motion == toStart || motion == wordLeft;
+    const auto erased = line.erase(motion);
+    if (!hadKilled) memory.killed.clear();
+    memory.killed.insert(isToLeft ? 0 : memory.killed.size(), erased);
+    hasKilled = true;
+  }
+
+  /// Has the lines of a paste in the editor one after the other: none runs without a key for it.
+  /// All other white space separates words, as a blank does.
+  void paste() {
+    std::string text;
+    while (!text.ends_with(kEndOfPaste) && readByte(text, -1)) {
+    }
+    if (text.ends_with(kEndOfPaste)) text.resize(text.size() - kEndOfPaste.size());
+    std::ranges::replace(text, '\r', '\n');
+    std::ranges::replace_if(
+        text, [](char c) { return c == '\t' || c == '\v' || c == '\f'; }, ' ');
+    if (!memory.pasted.empty() && !text.ends_with('\n')) text += '\n';
+    memory.pasted.insert(0, text);
+    takePasted();
+  }
+
+  void takePasted() {
+    const auto end = std::min(memory.pasted.find('\n'), memory.pasted.size());
+    line.insert(memory.pasted.substr(0, end));
+    memory.pasted.erase(0, end + 1);
+  }
+
+  /// The line at `index` of the history, as it has been edited.
+  const std::string& lineAt(std::size_t index) const {
+    const auto draft = drafts.find(index);
+    return draft != drafts.end() ? draft->second : memory.history[index];
+  }
+
+  void show(std::size_t newPlace) {
+    drafts[place] = line.text();
+    place = newPlace;
+    line.set(lineAt(place));
+  }
+
+  void search() {
+    wanted.emplace();
+    placeBefore = place;
+  }
+
+  /// Whether `key` is for the search under way. Any other key ends it, and does what it does to
+  /// what was found.
+  bool followSearch(const std::string& key) {
+    if (!wanted) return false;
+    if (key == kCtrlR) {
+      find(place);
+    } else if (isOneOf(kBackspace, key)) {
+      wanted->erase(left);
+      show(placeBefore);
+      find(memory.history.size());
+    } else if (isText(key)) {
+      wanted->insert(key);
+      find(std::min(place + 1, memory.history.size()));
+    } else {
+      wanted.reset();
+      if (key == kCtrlG) show(placeBefore);
+      return key == kCtrlG;
+    }
+    return true;
+  }
+
+  /// Goes to the newest line before `end` that holds what is wanted; stays where there is none.
+  void find(std::size_t end) {
+    while (!wanted->text().empty() && end-- > 0) {
+      const auto found = lineAt(end).find(wanted->text());
+      if (found == std::string::npos) continue;
+      show(end);
+      return line.set(line.text(), found);
+    }
+  }
+
+  /// Tab. Extends the word as far as all candidates agree; where that is no further, lists them.
+  void completeWord() {
+    const auto typed = line.beforeCursor();
+    const auto candidates = complete(typed);
+    if (candidates.empty()) return;
+    const auto start = typed.find_last_of(kWhiteSpace) + 1;
+    auto word = commonStart(candidates);
+    if (candidates.size() == 1 && !word.ends_with('/')) word += ' ';
+    if (start + word.size() <= typed.size()) return list(candidates);
+    const auto rest = line.text().substr(typed.size());
+    line.set(typed.substr(0, start) + word + rest, start + word.size());
+  }
+
+  /// Lists the candidates under the line, as many as the screen holds.
+  void list(const Candidates& candidates) {
+    std::vector<std::vector<host::Cell>> labels;
+    std::size_t widest = 0;
+    for (const auto& [word, note] : candidates) {
+      const auto slash = word.rfind('/', word.size() - 2);  // of a path, its last element
+      const auto name = word.substr(slash == std::string::npos ? 0 : slash + 1);
+      labels.push_back(host::cellsOf(note.empty() ? name : name + " (" + note + ')'));
+      widest = std::max(widest, host::columnsOf(labels.back()) + 2);
+    }
+    const auto [height, width] = host::sizeOfTerminal();
+    const auto columns = std::max<std::size_t>(1, width / widest);
+    const auto shown = std::min(labels.size(), columns * (height > 4 ? height - 3 : 1));
+    std::string text = "\r\n";
+    for (std::size_t i = 0; i < shown; ++i) {
+      const bool isLast = (i + 1) % columns == 0 || i + 1 == shown;
+      for (const auto& cell : labels[i]) text += cell.glyph;
+      text += isLast ? "\r\n" : std::string(widest - host::columnsOf(labels[i]), ' ');
+    }
+    if (shown < labels.size()) text += "... " + std::to_string(labels.size() - shown) + " more\r\n";
+    draw();
+    display.append(text);
+  }
 
   Memory& memory;
   const std::string& prompt;
@@ -116,241 +334,6 @@ class Editor {
   bool hadKilled = false;                     // and the one before
   std::optional<bool> isLine;                 // how the editing has ended
 };
-
-const Editor::Binding Editor::kBindings[] = {
-    {"\x01 \033[H \033[1~ \033[7~", [](Editor& e) { e.line.move(toStart); }},
-    {"\x05 \033[F \033[4~ \033[8~", [](Editor& e) { e.line.move(toEnd); }},
-    {"\x02 \033[D \033[1;2D", [](Editor& e) { e.line.move(left); }},
-    {"\x06 \033[C \033[1;2C", [](Editor& e) { e.line.move(right); }},
-    {"\033b \033[1;5D \033[1;3D", [](Editor& e) { e.line.move(wordLeft); }},
-    {"\033f \033[1;5C \033[1;3C", [](Editor& e) { e.line.move(wordRight); }},
-    {kBackspace, [](Editor& e) { e.line.erase(left); }},
-    {"\033[3~", [](Editor& e) { e.line.erase(right); }},
-    {"\x0B", [](Editor& e) { e.kill(toEnd); }},
-    {"\x15", [](Editor& e) { e.kill(toStart); }},
-    {"\x17 \033\x7F \033\x08", [](Editor& e) { e.kill(wordLeft); }},
-    {"\033d \033[3;5~ \033[3;3~", [](Editor& e) { e.kill(wordRight); }},
-    {"\x19", [](Editor& e) { e.line.insert(e.memory.killed); }},
-    {"\x14", [](Editor& e) { e.line.transpose(); }},
-    {"\x10 \033[A", [](Editor& e) { e.show(e.place > 0 ? e.place - 1 : 0); }},
-    {"\x0E \033[B", [](Editor& e) { e.show(std::min(e.place + 1, e.memory.history.size())); }},
-    {kCtrlR, [](Editor& e) { e.search(); }},
-    {"\t", [](Editor& e) { e.completeWord(); }},
-    {"\x0C", [](Editor& e) { e.clearScreen(); }},
-    {"\r \n", [](Editor& e) { e.accept(); }},
-    {"\x03", [](Editor& e) { e.giveUp(); }},
-    {"\x04", [](Editor& e) { e.eraseOrEnd(); }},
-    {"\033[200~", [](Editor& e) { e.paste(); }},
-};
-
-bool Editor::read(std::string& result) {
-  takePasted();
-  draw();
-  while (!isLine) {
-    const auto key = readKey();
-    if (key.empty()) return false;
-    press(key);
-  }
-  result = line.text();
-  return *isLine;
-}
-
-/// Reads all that one key sends; nothing at the end of the input.
-std::string Editor::readKey() {
-  std::string key;
-  if (!readByte(key, -1) || key != "\033") return key;
-  while (!isWhole(key) && readByte(key, kRestOfSequence)) {
-    if (key == "\033\033") key.pop_back();  // Alt with a key that starts with an escape itself
-  }
-  if (key.starts_with("\033O")) key[1] = '[';  // what a terminal sends in its application mode
-  return key;
-}
-
-/// Adds a byte to `key`. False at the end of the input, or when none comes within `milliseconds`.
-/// Before it waits, the screen shows what has been typed.
-bool Editor::readByte(std::string& key, int milliseconds) {
-  for (;;) {
-    auto event = session.wait(0);
-    if (event == TerminalSession::Event::timeout) {
-      draw();
-      event = session.wait(milliseconds);
-    }
-    switch (event) {
-      case TerminalSession::Event::input: {
-        const auto byte = session.read();
-        if (byte) key += *byte;
-        return byte.has_value();
-      }
-      case TerminalSession::Event::timeout:
-        return false;
-      case TerminalSession::Event::resized:
-        display.clear();
-        break;
-      case TerminalSession::Event::continued:
-        display.forget();
-        break;
-    }
-  }
-}
-
-void Editor::draw() {
-  const auto shown = wanted ? "(search)`" + wanted->text() + "': " : prompt;
-  display.draw(shown + line.text(), shown.size() + line.beforeCursor().size());
-}
-
-void Editor::press(const std::string& key) {
-  hadKilled = std::exchange(hasKilled, false);
-  if (followSearch(key)) return;
-  if (isText(key)) return line.insert(key);
-  for (const auto& [keys, act] : kBindings) {
-    if (isOneOf(keys, key)) return act(*this);
-  }
-}
-
-void Editor::accept() {
-  draw();
-  display.append("\r\n");
-  isLine = true;
-  auto& history = memory.history;
-  const bool isBlank = line.text().find_first_not_of(kWhiteSpace) == std::string::npos;
-  if (isBlank || (!history.empty() && history.back() == line.text())) return;
-  if (history.size() == kLongestHistory) history.erase(history.begin());
-  history.push_back(line.text());
-}
-
-/// Ctrl-C. The lines of a paste that are still to come go as well.
-void Editor::giveUp() {
-  draw();
-  display.append("^C\r\n");
-  line.set("");
-  memory.pasted.clear();
-  isLine = true;
-}
-
-void Editor::eraseOrEnd() {
-  if (line.text().empty()) isLine = false;
-  line.erase(right);
-}
-
-void Editor::clearScreen() {
-  session.write("\033[H\033[2J");
-  display.forget();
-}
-
-/// Erases for Ctrl-Y: what several keys in a row erase, as one text.
-void Editor::kill(EditedLine::Motion motion) {
-  const bool isToLeft = motion == toStart || motion == wordLeft;
-  const auto erased = line.erase(motion);
-  if (!hadKilled) memory.killed.clear();
-  memory.killed.insert(isToLeft ? 0 : memory.killed.size(), erased);
-  hasKilled = true;
-}
-
-/// Has the lines of a paste in the editor one after the other: none runs without a key for it. All
-/// other white space separates words, as a blank does.
-void Editor::paste() {
-  std::string text;
-  while (!text.ends_with(kEndOfPaste) && readByte(text, -1)) {
-  }
-  if (text.ends_with(kEndOfPaste)) text.resize(text.size() - kEndOfPaste.size());
-  std::ranges::replace(text, '\r', '\n');
-  std::ranges::replace_if(
-      text, [](char c) { return c == '\t' || c == '\v' || c == '\f'; }, ' ');
-  if (!memory.pasted.empty() && !text.ends_with('\n')) text += '\n';
-  memory.pasted.insert(0, text);
-  takePasted();
-}
-
-void Editor::takePasted() {
-  const auto end = std::min(memory.pasted.find('\n'), memory.pasted.size());
-  line.insert(memory.pasted.substr(0, end));
-  memory.pasted.erase(0, end + 1);
-}
-
-/// The line at `index` of the history, as it has been edited.
-const std::string& Editor::lineAt(std::size_t index) const {
-  const auto draft = drafts.find(index);
-  return draft != drafts.end() ? draft->second : memory.history[index];
-}
-
-void Editor::show(std::size_t newPlace) {
-  drafts[place] = line.text();
-  place = newPlace;
-  line.set(lineAt(place));
-}
-
-void Editor::search() {
-  wanted.emplace();
-  placeBefore = place;
-}
-
-/// Whether `key` is for the search under way. Any other key ends it, and does what it does to what
-/// was found.
-bool Editor::followSearch(const std::string& key) {
-  if (!wanted) return false;
-  if (key == kCtrlR) {
-    find(place);
-  } else if (isOneOf(kBackspace, key)) {
-    wanted->erase(left);
-    show(placeBefore);
-    find(memory.history.size());
-  } else if (isText(key)) {
-    wanted->insert(key);
-    find(std::min(place + 1, memory.history.size()));
-  } else {
-    wanted.reset();
-    if (key == kCtrlG) show(placeBefore);
-    return key == kCtrlG;
-  }
-  return true;
-}
-
-/// Goes to the newest line before `end` that holds what is wanted; stays where there is none.
-void Editor::find(std::size_t end) {
-  while (!wanted->text().empty() && end-- > 0) {
-    const auto found = lineAt(end).find(wanted->text());
-    if (found == std::string::npos) continue;
-    show(end);
-    return line.set(line.text(), found);
-  }
-}
-
-/// Tab. Extends the word as far as all candidates agree; where that is no further, lists them.
-void Editor::completeWord() {
-  const auto typed = line.beforeCursor();
-  const auto candidates = complete(typed);
-  if (candidates.empty()) return;
-  const auto start = typed.find_last_of(kWhiteSpace) + 1;
-  auto word = commonStart(candidates);
-  if (candidates.size() == 1 && !word.ends_with('/')) word += ' ';
-  if (start + word.size() <= typed.size()) return list(candidates);
-  const auto rest = line.text().substr(typed.size());
-  line.set(typed.substr(0, start) + word + rest, start + word.size());
-}
-
-/// Lists the candidates under the line, as many as the screen holds.
-void Editor::list(const Candidates& candidates) {
-  std::vector<std::vector<host::Cell>> labels;
-  std::size_t widest = 0;
-  for (const auto& [word, note] : candidates) {
-    const auto slash = word.rfind('/', word.size() - 2);  // of a path, its last element
-    const auto name = word.substr(slash == std::string::npos ? 0 : slash + 1);
-    labels.push_back(host::cellsOf(note.empty() ? name : name + " (" + note + ')'));
-    widest = std::max(widest, host::columnsOf(labels.back()) + 2);
-  }
-  const auto [height, width] = host::sizeOfTerminal();
-  const auto columns = std::max<std::size_t>(1, width / widest);
-  const auto shown = std::min(labels.size(), columns * (height > 4 ? height - 3 : 1));
-  std::string text = "\r\n";
-  for (std::size_t i = 0; i < shown; ++i) {
-    const bool isLast = (i + 1) % columns == 0 || i + 1 == shown;
-    for (const auto& cell : labels[i]) text += cell.glyph;
-    text += isLast ? "\r\n" : std::string(widest - host::columnsOf(labels[i]), ' ');
-  }
-  if (shown < labels.size()) text += "... " + std::to_string(labels.size() - shown) + " more\r\n";
-  draw();
-  display.append(text);
-}
 
 }  // namespace
 
