@@ -51,10 +51,10 @@ void addAll(std::string& seen, const host::LogEntry& entry, const host::EventFil
 
 /// All that the log says.
 std::string read(std::string_view log, std::size_t piece, const host::EventFilter& filter) {
-  host::RecordedLogReader reader(pieces(log, piece));
+  const auto reader = host::readRecordedLog(pieces(log, piece));
   std::string seen;
   try {
-    while (reader.next()) addAll(seen, reader.entry(), filter);
+    while (reader->next()) addAll(seen, reader->entry(), filter);
   } catch (const host::DamagedLog& damage) {
     seen += damage.what();
   }
@@ -63,7 +63,7 @@ std::string read(std::string_view log, std::size_t piece, const host::EventFilte
 
 /// A run of one byte, so long that it and what surrounds it end near the end of the buffer.
 std::string longRun(unsigned char seed) {
-  const std::size_t size = host::RecordedLogReader::kBuffer - 64 + seed % 128;
+  const std::size_t size = host::kRecordedLogBuffer - 64 + seed % 128;
   return std::string(size, seed < 128 ? 'v' : '\xE4');
 }
 

@@ -31,7 +31,6 @@
 
 using namespace std::chrono_literals;
 using namespace std::string_literals;
-using host::RecordedLogReader;
 using Texts = std::vector<std::string>;
 
 namespace {
@@ -60,11 +59,11 @@ auto pieces(std::string_view log, std::size_t most) {
 
 /// The messages of a log, and after them how it ends.
 Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {
-  RecordedLogReader reader(pieces(log, piece));
+  const auto reader = host::readRecordedLog(pieces(log, piece));
   Texts seen;
   try {
-    while (reader.next()) {
-      seen.emplace_back(reader.entry()[host::Field::message]);
+    while (reader->next()) {
+      seen.emplace_back(reader->entry()[host::Field::message]);
     }
     seen.emplace_back("end");
   } catch (const host::DamagedLog& damage) {
@@ -98,10 +97,10 @@ TEST(RecordedLog, EachPartOfAnEventHasItsFieldsInLine) {
   moveEast();
   forEachRow("event-fields", 2, [](const Row& row) {
     const std::string log = kDate + row[0] + '\n';
-    RecordedLogReader reader(pieces(log, 1));
-    ASSERT_TRUE(reader.next());
+    const auto reader = host::readRecordedLog(pieces(log, 1));
+    ASSERT_TRUE(reader->next());
     std::string texts;
-    EXPECT_EQ(summary(host::LogEvent(reader.entry(), texts)), row[1]);
+    EXPECT_EQ(summary(host::LogEvent(reader->entry(), texts)), row[1]);
   });
 }
 

@@ -35,7 +35,7 @@ class RecordedSource final : public LogSource {
       offset += static_cast<off_t>(count.value_or(0));
       return count;
     };
-    return std::make_unique<RecordedLogReader>(readBytes);
+    return readRecordedLog(readBytes);
   }
 
  private:
