@@ -4,9 +4,15 @@
 #include <string>
 
 namespace host {
+namespace {
+
+struct Place {
+  std::size_t row;
+  std::size_t column;
+};
 
 /// Where the cells of a text stand, in rows of a number of columns.
-struct LineDisplay::Layout {
+struct Layout {
   Layout(const std::vector<Cell>& cells, std::size_t columns) : cells(cells) {
     std::size_t column = 0;
     for (std::size_t i = 0; i < cells.size(); ++i) {
@@ -31,21 +37,19 @@ struct LineDisplay::Layout {
   std::vector<std::size_t> starts = {0};  // of each row, its first cell
 };
 
-namespace {
-
 std::string control(std::size_t count, char function) {
   return count > 0 ? "\033[" + std::to_string(count) + function : "";
 }
 
-}  // namespace
-
 /// What moves the cursor there. It counts columns from the left, so that a glyph that the terminal
 /// takes for wider or narrower does not matter beyond it.
-std::string LineDisplay::moving(Place from, Place to) {
+std::string moving(Place from, Place to) {
   if (from.row == to.row && from.column == to.column) return "";
   return control(from.row - std::min(from.row, to.row), 'A') +
          control(to.row - std::min(from.row, to.row), 'B') + '\r' + control(to.column, 'C');
 }
+
+}  // namespace
 
 void LineDisplay::draw(std::string_view text, std::size_t cursor) {
   const auto [height, columns] = sizeOfTerminal();

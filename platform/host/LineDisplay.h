@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstddef>
-#include <string>
 #include <string_view>
 #include <vector>
 
@@ -34,14 +33,6 @@ class LineDisplay {
   void append(std::string_view text);
 
  private:
-  struct Place {
-    std::size_t row;
-    std::size_t column;
-  };
-  struct Layout;
-
-  static std::string moving(Place from, Place to);
-
   TerminalSession& session;
   std::vector<Cell> drawn;
   std::size_t drawnCursor = 0;  // the cell before which the cursor stands

@@ -19,6 +19,7 @@ namespace {
 using Candidates = std::map<std::string, std::string>;
 using host::EditedLine;
 using host::TerminalSession;
+using Event = TerminalSession::Event;
 using enum host::EditedLine::Motion;
 
 constexpr std::size_t kLongestHistory = 1000;  // lines
@@ -109,25 +110,17 @@ class Editor {
   bool readByte(std::string& key, int milliseconds) {
     for (;;) {
       auto event = session.wait(0);
-      if (event == TerminalSession::Event::timeout) {
+      if (event == Event::timeout) {
         draw();
         event = session.wait(milliseconds);
       }
-      switch (event) {
-        case TerminalSession::Event::input: {
-          const auto byte = session.read();
-          if (byte) key += *byte;
-          return byte.has_value();
-        }
-        case TerminalSession::Event::timeout:
-          return false;
-        case TerminalSession::Event::resized:
-          display.clear();
-          break;
-        case TerminalSession::Event::continued:
-          display.forget();
-          break;
-      }
+      if (event == Event::timeout) return false;
+      if (event == Event::resized) display.clear();
+      if (event == Event::continued) display.forget();
+      if (event != Event::input) continue;
+      const auto byte = session.read();
+      if (byte) key += *byte;
+      return byte.has_value();
     }
   }
 
