@@ -7,9 +7,14 @@
 // Allocations up to the one that fails, 0 after it; -1: none is to fail.
 static std::atomic<int> left = -1;
 
-FailingAllocation::FailingAllocation(int nth) { left = nth; }
-FailingAllocation::~FailingAllocation() { left = -1; }
-bool FailingAllocation::hasFailed() { return left == 0; }
+bool failAllocation(int nth, const std::function<void()>& work) {
+  left = nth;
+  try {
+    work();
+  } catch (const std::bad_alloc&) {
+  }
+  return left.exchange(-1) == 0;
+}
 
 void* operator new(std::size_t size) {
   int before = left;

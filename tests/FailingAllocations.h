@@ -1,11 +1,8 @@
 #pragma once
 
-/// Has one allocation fail, in any thread: a program that links this has its operator new.
-class FailingAllocation {
- public:
-  /// The `nth` allocation from now on throws `std::bad_alloc`.
-  explicit FailingAllocation(int nth);
-  ~FailingAllocation();
+#include <functional>
 
-  static bool hasFailed();
-};
+/// Calls `work` with its allocation number `nth`, in any thread, throwing `std::bad_alloc`, which
+/// may end it. Returns whether there was such an allocation. A program that links this has its
+/// operator new.
+bool failAllocation(int nth, const std::function<void()>& work);

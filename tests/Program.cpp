@@ -38,8 +38,7 @@ void expectOutcome(const Outcome& actual, const Outcome& expected) {
 }
 
 Program::Program(const Start& start) {
-  writeFile(scratch->path("device"),
-            start.profile + "\nrequest-log = " + scratch->path("requests") + "\n");
+  writeFile(scratch->path("device"), start.profile + "\nrequest-log = requests\n");
   const termios settings = terminalBefore();
   const winsize size = {.ws_row = 24, .ws_col = 80, .ws_xpixel = 0, .ws_ypixel = 0};
   int ends[2];
@@ -63,7 +62,8 @@ void Program::execute(const Start& start, int end) const {
   }
   setenv("TZ", "UTC", 1);
   setenv("TERM", start.term.c_str(), 1);
-  setenv("ZUB_DEVICE", scratch->path("device").c_str(), 1);
+  setenv("ZUB_DEVICE", "device", 1);
+  std::filesystem::current_path(scratch->path(""));
   std::vector<std::string> command = {ZUBTOOL_EMULATOR};
   const bool isEmulated = !command.front().empty();
   if (isEmulated) {
@@ -111,10 +111,6 @@ Outcome Program::finish() {
   waitpid(process, &status, 0);
   outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : 1000 + WTERMSIG(status);
   outcome.err = readFile(scratch->path("err"));
-  const auto folder = scratch->path("");  // of another name each time
-  for (auto at = outcome.err.find(folder); at != std::string::npos; at = outcome.err.find(folder)) {
-    outcome.err.replace(at, folder.size(), "DIR/");
-  }
   outcome.requests = readFile(scratch->path("requests"));
   return outcome;
 }

@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <new>
 #include <sstream>
 
 #include "logdump/TraceProperty.h"
@@ -66,18 +65,13 @@ TEST(ZUBCommand, OutlivesEachAllocationOfACollectionThatFails) {
       const CapturedOutput out;
       std::cout << "this takes the memory for all of the output" << std::endl;
       bool succeeded = false;
-      {
-        const FailingAllocation failing(nth);
-        try {
-          zub::client::EventsOff(followed);
-          zub::client::EventsOn(followed);
-          const auto manager = zub::client::CreateManager("test", queue);
-          const auto root = ZUBCommand::create("zubtool", {}, manager, queue);
-          succeeded = root->getSubCommandObj("logdump")->execCommand(handler, {"reason"});
-        } catch (const std::bad_alloc&) {
-        }
-        failed = FailingAllocation::hasFailed();
-      }
+      failed = failAllocation(nth, [&] {
+        zub::client::EventsOff(followed);
+        zub::client::EventsOn(followed);
+        const auto manager = zub::client::CreateManager("test", queue);
+        const auto root = ZUBCommand::create("zubtool", {}, manager, queue);
+        succeeded = root->getSubCommandObj("logdump")->execCommand(handler, {"reason"});
+      });
       EXPECT_TRUE(!succeeded || out.str().find("og collection") != std::string::npos) << handler;
       EXPECT_TRUE(failed || out.str().find("\n$Path = ") != std::string::npos) << out.str();
     }

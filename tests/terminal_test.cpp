@@ -95,13 +95,6 @@ TEST(EditedLine, IsWhatTheKeysMakeOfIt) {
   EXPECT_EQ(typist.ended(), 7);
 }
 
-TEST(EditedLine, HoldsAsMuchAsIsTyped) {
-  Typist typist("screen-256color", kUsual);
-  const std::string text(20'000, 'x');
-  typist.type(text + "\001" + text + "\033[200~" + text + "\033[201~\r");
-  EXPECT_EQ(typist.line(), text + text + text);
-}
-
 TEST(EditedLine, IsDrawnAnewWhenTheTerminalHasAnotherSize) {
   Typist typist("xterm-256color", kUsual);
   const std::string text(75, 'r');
@@ -143,17 +136,11 @@ class Terminal : public testing::Test {
     EXPECT_EQ(outcome.status, status);
   }
 
-  /// Ctrl-S.
+  /// As Ctrl-S does.
   void stopOutput() {
-    auto settings = Program::terminalBefore();
-    settings.c_iflag |= IXON;
-    tcsetattr(program->terminal(), TCSANOW, &settings);
-    int inPackets = 1;  // which show that the terminal has taken the key
-    ioctl(program->terminal(), TIOCPKT, &inPackets);
-    program->type("\023");
-    pollfd taken = {program->terminal(), POLLIN | POLLPRI, 0};
-    while ((taken.revents & POLLPRI) == 0) poll(&taken, 1, -1);
-    ioctl(program->terminal(), TIOCPKT, &(inPackets = 0));
+    const int side = open(ptsname(program->terminal()), O_RDWR | O_NOCTTY | O_CLOEXEC);
+    EXPECT_EQ(tcflow(side, TCOOFF), 0);
+    close(side);
   }
 
   std::optional<Program> program;
