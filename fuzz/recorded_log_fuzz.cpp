@@ -2,28 +2,18 @@
 // of a size that the first byte gives, with all that can be asked of each event. What the reader
 // says must not depend on the pieces.
 
-#include <algorithm>
 #include <cstdint>
 #include <cstdlib>
-#include <optional>
 #include <string>
 #include <string_view>
 
+#include "fuzz/RecordedLogs.h"
 #include "platform/host/log/EventFilter.h"
 #include "platform/host/log/LogEvent.h"
 #include "platform/host/log/RecordedLogReader.h"
 #include "platform/posix/Utf8.h"
 
 namespace {
-
-/// Gives the bytes of a log, `most` at a time.
-auto pieces(std::string_view log, std::size_t most) {
-  return [log, most](char* buffer, std::size_t size) mutable {
-    const std::size_t count = log.copy(buffer, std::min(size, most));
-    log.remove_prefix(count);
-    return std::optional(count);
-  };
-}
 
 void require(bool holds) {
   if (!holds) std::abort();
@@ -67,13 +57,6 @@ std::string longRun(unsigned char seed) {
   return std::string(size, seed < 128 ? 'v' : '\xE4');
 }
 
-/// Appends a field with its length in front.
-void addBinary(std::string& log, std::string_view name, std::string_view value) {
-  log.append(name) += '\n';
-  for (unsigned i = 0; i < 8; ++i) log += static_cast<char>(std::uint64_t{value.size()} >> (8 * i));
-  log.append(value) += '\n';
-}
-
 /// A log of whole fields and entries: each two bytes of `recipe` are a part and its seed. At most
 /// `mostLong` parts are long, so that fields and entries lie across the end of the buffer.
 std::string build(std::string_view recipe, int mostLong) {
@@ -94,10 +77,10 @@ std::string build(std::string_view recipe, int mostLong) {
         log += "_EXE=/usr/" + run + "\n";
         break;
       case 3:
-        addBinary(log, "MESSAGE", run);
+        log += binary("MESSAGE", run);
         break;
       case 4:
-        addBinary(log, "UNWANTED", shortRun + run);
+        log += binary("UNWANTED", shortRun + run);
         break;
       case 5:
         log += "_COMM=sshd\\" + std::to_string(seed) + "\n";

@@ -15,6 +15,7 @@
 #include <new>
 #include <sstream>
 
+#include "fuzz/RecordedLogs.h"
 #include "oslog/OsLogStream.h"
 #include "platform/host/device/Device.h"
 #include "platform/host/log/FoldedText.h"
@@ -38,24 +39,6 @@ namespace {
 const std::string kDate = "__REALTIME_TIMESTAMP=1700000000000000\n";
 
 const std::string kForged = "x\n\nMESSAGE=forged\n" + kDate + "\n";
-
-/// An entry's binary field, whose declared length may be another than its own.
-std::string binary(const std::string& name, const std::string& value,
-                   std::optional<std::uint64_t> declared = {}) {
-  const auto length = declared.value_or(value.size());
-  std::string text = name + '\n';
-  for (int i = 0; i < 8; ++i) text += static_cast<char>(length >> (8 * i));
-  return text + value + '\n';
-}
-
-/// Gives the bytes of a log, `most` at a time.
-auto pieces(std::string_view log, std::size_t most) {
-  return [log, most](char* buffer, std::size_t size) mutable {
-    const std::size_t count = log.copy(buffer, std::min(size, most));
-    log.remove_prefix(count);
-    return std::optional(count);
-  };
-}
 
 /// The messages of a log, and after them how it ends.
 Texts readAll(std::string_view log, std::size_t piece = 1 << 20) {

@@ -1,7 +1,6 @@
 #include "platform/host/log/FoldedText.h"
 
 #include <algorithm>
-#include <array>
 
 #include "platform/posix/Utf8.h"
 
@@ -21,26 +20,10 @@ constexpr std::u16string_view kExtendedAdditional =
     u"aaaaaaaaaaaaaaaaaaaaaaaaeeeeeeeeeeeeeeeeiiiioooooooooooooooooooooooouuuuuuuuuuuu"
     u"uuyyyyyyyyỻỻỽỽyy";
 
-/// Letters outside those two ranges that are the other case of one inside.
-struct Outsider {
-  char16_t letter;
-  char16_t base;
-};
-constexpr auto kOutsiders = std::to_array<Outsider>({
-    {u'ɓ', u'b'},
-    {u'ɖ', u'd'},
-    {u'ɗ', u'd'},
-    {u'ɠ', u'g'},
-    {u'ɨ', u'i'},
-    {u'ɲ', u'n'},
-    {u'ɵ', u'o'},
-    {u'ʈ', u't'},
-    {u'ʋ', u'v'},
-    {u'ⱥ', u'a'},
-    {u'ⱦ', u't'},
-    {u'Ȿ', u's'},
-    {u'Ɀ', u'z'},
-});
+/// Letters outside those two ranges that are the other case of one inside, and what they fold to.
+constexpr std::u32string_view kOutside = U"ɓɖɗɠɨɲɵʈʋⱥⱦⱾⱿ";
+constexpr std::u32string_view kOutsideBase = U"bddginotvatsz";
+static_assert(kOutside.size() == kOutsideBase.size());
 
 constexpr char32_t kFirstMark = 0x300;
 constexpr char32_t kLastMark = 0x36F;
@@ -67,8 +50,8 @@ char32_t baseLetter(char32_t code) {
   if (covers(kExtendedAdditional, kAdditionalFirst, code)) {
     return kExtendedAdditional[code - kAdditionalFirst];
   }
-  const auto* const outsider = std::ranges::find(kOutsiders, code, &Outsider::letter);
-  return outsider == kOutsiders.end() ? code : outsider->base;
+  const auto outside = kOutside.find(code);
+  return outside == kOutside.npos ? code : kOutsideBase[outside];
 }
 
 std::string fold(std::string_view text) {
