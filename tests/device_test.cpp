@@ -100,7 +100,9 @@ TEST(RequestLog, SaysWhyItCannotBeWritten) {
   for (const auto& [path, shown, why] :
        {std::tuple("no/e\u0301 \x1b]0;\xC2\x9B\x7F", "no/e\u0301 \\x1b]0;\\x9b\\x7f",
                    "No such file or directory"),
-        {"/dev/full", "/dev/full", "No space left on device"}}) {
+        {"/dev/full", "/dev/full", "No space left on device"},
+        {"/proc/self/exe", "/proc/self/exe", "Operation not permitted"}}) {
+    host::device().file = "/proc/self/exe";
     host::device().requestLog = path;
     testing::internal::CaptureStderr();
     host::recordRequest("request");

@@ -48,10 +48,10 @@ TEST(Program, TakesSignalsOnOneThread) {
 TEST(Program, ExportsTheLogOfARealMachine) {
   const ScratchFolder folder;
   const std::string data = ZUBTOOL_SOURCES "/tests/data/machine.";
-  const Start start = {{"logdump", "oslog", "2147483647", folder.path("out"), "-p",
-                        "systemd-journald", "-i", "LOGGER", "python"},
-                       "log = " + data + "export"};
-  expectOutcome(run(start), {});
+  expectOutcome(run({{"logdump", "oslog", "2147483647", folder.path("out"), "-p",
+                      "systemd-journald", "-i", "LOGGER", "python"},
+                     "log = " + data + "export"}),
+                {});
   EXPECT_EQ(readFile(folder.path("out")), readFile(data + "txt"));
   expectOutcome(run({{"logdump", "oslog", "600", folder.path("out")}}), {});
   EXPECT_EQ(std::ranges::count(readFile(folder.path("out")), '\n'), 6) << "of the sample";

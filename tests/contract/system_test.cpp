@@ -66,9 +66,8 @@ TEST(StandardStreams, GoOnAfterAFailureWriteEachLineAtOnceAndDropNoByte) {
     dup2(ends[1], number);
     *stream << "line " << 1 << std::endl;
     const auto line = take();
-    std::size_t written = 0;
-    for (; written < 10'000; ++written) stream->put('x');  // more than a buffer holds
-    *stream << std::flush;
+    std::size_t written = 10'000;  // more than a buffer holds
+    *stream << std::string(written, 'x') << std::flush;
     dup2(before, number);
     EXPECT_EQ(line, "line 1\n");
     for (auto piece = take(); !piece.empty(); piece = take()) written -= piece.size();
