@@ -105,6 +105,7 @@ TEST(EditedLine, IsDrawnAnewWhenTheTerminalHasAnotherSize) {
   typist.type("z\001t T\b \005\r");
   EXPECT_EQ(typist.line(), "t  " + text + 'z');
   EXPECT_EQ(shown(typist.before, 30), "> t  " + text + 'z');
+  EXPECT_EQ(typist.before.find("\r\033[J"), std::string::npos) << "tmux would keep what is cleared";
 }
 
 TEST(EditedLine, LeavesTheTerminalAsItWasWhateverSignalEndsIt) {

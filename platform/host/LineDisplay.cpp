@@ -67,9 +67,13 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
 
   const Layout before(drawn, columns);
   const Layout now(cells, columns);
-  std::string output = drawn.empty() ? "\r\033[J" : "";
-  output += moving(before.placeOf(drawnCursor), before.placeOf(same));
-  if (same < drawn.size()) output += "\033[J";
+  std::string output =
+      drawn.empty() ? "\r" : moving(before.placeOf(drawnCursor), before.placeOf(same));
+  if (same == 0) {
+    output += " \033[J\r";  // not from the screen's first cell on: tmux would keep that as history
+  } else if (same < drawn.size()) {
+    output += "\033[J";
+  }
   for (auto i = same; i < cells.size(); ++i) output += cells[i].glyph;
   auto end = now.placeOf(cells.size());
   if (end.row == height) {

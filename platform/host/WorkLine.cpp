@@ -43,7 +43,7 @@ bool wasLineTyped() {
 void clear() {
   if (!gIsShown) return;
   gIsShown = false;
-  if (host::hasTerminal(STDOUT_FILENO)) print(wasLineTyped() ? "\033[A\r\033[J" : "\r\033[K");
+  if (host::hasTerminal(STDOUT_FILENO)) print(wasLineTyped() ? "\033[A\r \033[J\r" : "\r\033[K");
 }
 
 void stopShowing() {
