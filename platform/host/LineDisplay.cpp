@@ -22,7 +22,7 @@ struct Layout {
       }
       column += cells[i].columns;
     }
-    if (column >= columns) starts.push_back(cells.size());  // what comes next has a row of its own
+    endsRow = column >= columns;
   }
 
   /// The place of the cell at `index`, or of what comes after them all.
@@ -35,6 +35,7 @@ struct Layout {
 
   const std::vector<Cell>& cells;
   std::vector<std::size_t> starts = {0};  // of each row, its first cell
+  bool endsRow;                           // the last row is full
 };
 
 std::string control(std::size_t count, char function) {
@@ -55,6 +56,7 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
   const auto [height, columns] = sizeOfTerminal();
   auto cells = cellsOf(text);
   auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
+  if (Layout(cells, columns).endsRow) cells.push_back({" ", 1});  // what the cursor stands on
   auto same = static_cast<std::size_t>(std::ranges::mismatch(drawn, cells).in1 - drawn.begin());
   if (const Layout all(cells, columns); all.starts.size() > height) {
     const auto last = std::max(all.placeOf(at).row + 1, height);
@@ -67,21 +69,15 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
 
   const Layout before(drawn, columns);
   const Layout now(cells, columns);
-  std::string output =
-      drawn.empty() ? "\r" : moving(before.placeOf(drawnCursor), before.placeOf(same));
-  if (same == 0) {
-    output += " \033[J\r";  // not from the screen's first cell on: tmux would keep that as history
-  } else if (same < drawn.size()) {
-    output += "\033[J";
+  const Place start = before.placeOf(same);
+  std::string output = drawn.empty() ? "\r" : moving(before.placeOf(drawnCursor), start);
+  if (drawn.empty() || same < drawn.size()) {
+    // tmux takes a row that is cleared from its first column on for a line of its own, and keeps
+    // the whole screen as history.
+    output += start.column > 0 ? "\033[J" : " \033[J\r";
   }
   for (auto i = same; i < cells.size(); ++i) output += cells[i].glyph;
-  auto end = now.placeOf(cells.size());
-  if (end.row == height) {
-    --end.row;  // the last row is full, and the terminal waits for another glyph to go on
-  } else if (end.column == 0 && same < cells.size()) {
-    output += " \r";  // which is that glyph
-  }
-  output += moving(end, now.placeOf(at));
+  output += moving(now.placeOf(cells.size()), now.placeOf(at));
   session.write(output);
   drawn = std::move(cells);
   drawnCursor = at;
@@ -100,7 +96,8 @@ void LineDisplay::forget() {
 
 void LineDisplay::append(std::string_view text) {
   const Layout rows(drawn, sizeOfTerminal().columns);
-  session.write(moving(rows.placeOf(drawnCursor), rows.placeOf(drawn.size())) + std::string(text));
+  const Place lastRow = {rows.starts.size() - 1, 0};
+  session.write(moving(rows.placeOf(drawnCursor), lastRow) + "\r\n" + std::string(text));
   forget();
 }
 

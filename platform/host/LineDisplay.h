@@ -29,7 +29,7 @@ class LineDisplay {
   /// Leaves what is drawn where it is; the next is drawn in the cursor's own row.
   void forget();
 
-  /// Shows `text` after what is drawn, in rows of its own, and leaves that.
+  /// Shows `text` in rows of its own after what is drawn, and leaves that where it is.
   void append(std::string_view text);
 
  private:

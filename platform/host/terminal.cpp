@@ -170,7 +170,7 @@ class Editor {
 
   void accept() {
     draw();
-    display.append("\r\n");
+    display.append("");
     isLine = true;
     auto& history = memory.history;
     const bool isBlank = line.text().find_first_not_of(kWhiteSpace) == std::string::npos;
@@ -181,8 +181,10 @@ class Editor {
 
   /// Ctrl-C. The lines of a paste that are still to come go as well.
   void giveUp() {
+    line.move(toEnd);
+    line.insert("^C");
     draw();
-    display.append("^C\r\n");
+    display.append("");
     line.set("");
     memory.pasted.clear();
     isLine = true;
@@ -302,7 +304,7 @@ class Editor {
     const auto [height, width] = host::sizeOfTerminal();
     const auto columns = std::max<std::size_t>(1, width / widest);
     const auto shown = std::min(labels.size(), columns * (height > 4 ? height - 3 : 1));
-    std::string text = "\r\n";
+    std::string text;
     for (std::size_t i = 0; i < shown; ++i) {
       const bool isLast = (i + 1) % columns == 0 || i + 1 == shown;
       for (const auto& cell : labels[i]) text += cell.glyph;
