@@ -69,7 +69,6 @@ for shell in bash zsh fish; do
   done
   check_offer "$shell" 'zubtool logdump bb NONUI Tar tar.gz nocompress' "${tree[zubtool logdump bb]-}"$'\n--'
   check_offer "$shell" 'zubtool logdump tel why' ''
-  check_offer "$shell" 'zubtool logdump why' ''
   check_offer "$shell" 'zubtool logdump oslog 600 out.txt -p a -i' ''
   check_offer "$shell" 'zubtool logdump tel -- cd' "${tree[zubtool cd]}"
 done

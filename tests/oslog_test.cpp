@@ -8,7 +8,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <array>
 #include <functional>
 #include <mutex>
 #include <new>
@@ -227,9 +226,8 @@ TEST_F(OsLogStreamTest, TellsWhatEndsItEarly) {
   EXPECT_EQ(errors, "Invalid oslog stream: reason = 7\n");
   thread.join();
   events.resize(3);
-  for (const auto& [path, message, why] :
-       {std::array{"/dev/full", "m", "No space left on device"},
-        std::array{"/dev/null", "too long", "Cannot allocate memory"}}) {
+  for (const auto& [path, message, why] : {std::tuple("/dev/full", "m", "No space left on device"),
+                                           {"/dev/null", "too long", "Cannot allocate memory"}}) {
     errors.clear();
     output = path;
     events[0].message = message;

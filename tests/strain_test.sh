@@ -50,6 +50,7 @@ expect_status 0 "standard output without a reader" \
   bash -c 'set -o pipefail; "$0" help | true' "$program"
 expect_status 0 "a limit to a file's size" sh -c 'ulimit -f 0; "$0" help >full' "$program"
 expect_status 0 "full standard output" sh -c '"$0" logdump tel >/dev/full' "$program"
+expect_status 1 "standard input that cannot be read" sh -c '"$0" </' "$program"
 expect_status 1 "too many words" \
   sh -c 'ulimit -v 600000; (yes x | head -n 20000000 | tr "\n" " "; echo; echo quit) | "$0"' "$program"
 [ "$(cat err)" = 'Not enough memory' ] || fail "too many words: $(cat err)"
