@@ -188,9 +188,10 @@ class LogStore : public testing::Test {
   }
 
   /// Exports `log`, of `lines` lines, with each allocation failing in turn.
-  void starve(const std::string& log, std::ptrdiff_t lines) const {
+  static void starve(const std::string& log, std::ptrdiff_t lines) {
     host::device().log = log;
-    const std::string file = scratch.path("export");
+    const ScratchFolder elsewhere;
+    const std::string file = elsewhere.path("export");
     bool succeeded = false;
     const auto put = [&] {
       succeeded = OsLogStream::putOsLogStreamToFile(file, {"nobody"}, {"/É"}, 4e9);
@@ -431,7 +432,7 @@ TEST_F(Journal, GivesWhatItWasMadeFromForAnyFilter) {
 TEST_F(Journal, RefusesAFileThatItCannotRead) {
   const std::string file =
       makeFile("x", kDate + "_BOOT_ID=0123456789abcdef0123456789abcdef\n_EXE=/É/x\nMESSAGE=m\n\n");
-  starve(file, 1);
+  starve(folder, 1);
   for (const auto& [text, why] : {std::pair(std::string(), "cut off"),
                                   {std::string(1000, 'x'), "no journal file, or damaged"}}) {
     write("y.journal", text);

@@ -1,5 +1,6 @@
 #include "platform/host/log/JournalFiles.h"
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
@@ -7,6 +8,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <fstream>
+#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string_view>
@@ -45,24 +47,32 @@ std::string machineId(std::string_view text) {
   throw std::runtime_error(what);
 }
 
-/// The entries of a folder; none where there is no such folder.
-std::vector<fs::directory_entry> entriesOf(const fs::path& folder) try {
-  const fs::directory_iterator first(folder);
-  return {begin(first), end(first)};
-} catch (const fs::filesystem_error& error) {
-  if (error.code() != std::errc::no_such_file_or_directory) refuseUnreadable(folder, error.code());
-  return {};
+/// What is in a folder, itself and the one above it included; nothing where there is no such
+/// folder. Read with the C library: an iterator of the C++ library ends the process for want of
+/// memory.
+std::vector<fs::path> entriesOf(const fs::path& folder) {
+  const std::unique_ptr<DIR, int (*)(DIR*)> opened(::opendir(folder.c_str()), ::closedir);
+  if (!opened && errno == ENOENT) return {};
+  std::vector<fs::path> entries;
+  while (opened) {
+    errno = 0;
+    const dirent* const entry = ::readdir(opened.get());
+    if (entry == nullptr) break;
+    entries.push_back(folder / entry->d_name);
+  }
+  if (errno != 0) refuseUnreadable(folder, {errno, std::generic_category()});
+  return entries;
 }
 
 /// `folder` and those below it that are called by machine IDs, or by `onlyId`.
 void addFolders(const fs::path& folder, const std::optional<std::string>& onlyId,
                 std::vector<fs::path>& folders) {
   folders.push_back(folder);
-  for (const fs::directory_entry& entry : entriesOf(folder)) {
-    const std::string id = machineId(entry.path().filename().string());
-    std::error_code error;
-    if (id.empty() || (onlyId && id != *onlyId) || !entry.is_directory(error)) continue;
-    folders.push_back(entry.path());
+  for (const fs::path& entry : entriesOf(folder)) {
+    const std::string id = machineId(entry.filename().string());
+    std::error_code unknown;
+    if (id.empty() || (onlyId && id != *onlyId)) continue;
+    if (fs::is_directory(entry, unknown) || unknown) folders.push_back(entry);
   }
 }
 
@@ -89,11 +99,12 @@ std::vector<fs::path> filesOf(const std::string& journal) {
   if (folders.empty()) return {journal};
   std::vector<fs::path> files;
   for (const fs::path& folder : folders) {
-    for (const fs::directory_entry& entry : entriesOf(folder)) {
-      const fs::path ending = entry.path().extension();
-      std::error_code error;
+    for (const fs::path& entry : entriesOf(folder)) {
+      const fs::path ending = entry.extension();
+      std::error_code unknown;
+      const fs::file_status status = fs::symlink_status(entry, unknown);
       if (ending != ".journal" && ending != ".journal~") continue;
-      if (entry.is_regular_file(error) || entry.is_symlink(error)) files.push_back(entry.path());
+      if (unknown || fs::is_regular_file(status) || fs::is_symlink(status)) files.push_back(entry);
     }
   }
   return files;
