@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <variant>
 #include <vector>
 
@@ -10,19 +11,14 @@
 namespace lumo {
 
 class object;
-struct entry;
+
+/// A key and its value.
+using entry = std::pair<std::string, object>;
 
 /// Maps texts to values, in the order in which the keys were first set. A reference to a value is
 /// valid until the dictionary is changed or destroyed.
 class dict {
  public:
-  dict();
-  dict(const dict&);
-  dict(dict&&) noexcept;
-  dict& operator=(const dict&);
-  dict& operator=(dict&&) noexcept;
-  ~dict();
-
   /// Sets the value of `key`. A key that is set again keeps its place.
   void set(std::string_view key, object value);
 
@@ -59,11 +55,6 @@ class object {
 
  private:
   std::variant<std::monostate, std::string, bool, std::int64_t, dict> value;
-};
-
-struct entry {
-  std::string key;
-  object value;
 };
 
 /// The text that `value` holds, or `otherwise` when it holds no text.

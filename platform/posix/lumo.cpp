@@ -12,25 +12,18 @@ const object& nullObject() {
 
 }  // namespace
 
-dict::dict() = default;
-dict::dict(const dict&) = default;
-dict::dict(dict&&) noexcept = default;
-dict& dict::operator=(const dict&) = default;
-dict& dict::operator=(dict&&) noexcept = default;
-dict::~dict() = default;
-
 void dict::set(std::string_view key, object value) {
-  const auto found = std::ranges::find(items, key, &entry::key);
+  const auto found = std::ranges::find(items, key, &entry::first);
   if (found != items.end()) {
-    found->value = std::move(value);
+    found->second = std::move(value);
   } else {
-    items.push_back({std::string(key), std::move(value)});
+    items.emplace_back(key, std::move(value));
   }
 }
 
 const object& dict::get(std::string_view key) const {
-  const auto found = std::ranges::find(items, key, &entry::key);
-  return found != items.end() ? found->value : nullObject();
+  const auto found = std::ranges::find(items, key, &entry::first);
+  return found != items.end() ? found->second : nullObject();
 }
 
 const object& object::get(std::string_view key) const {

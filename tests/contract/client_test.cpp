@@ -89,7 +89,7 @@ TEST(Dictionary, KeepsTheOrderOfItsKeysAndReadsWhatIsMissingAsTheNullObject) {
   outer.set("a", true);
   outer.set("inner", inner);
   ASSERT_EQ(outer.entries().size(), 2);
-  EXPECT_EQ(outer.entries()[0].key, "inner");
+  EXPECT_EQ(outer.entries()[0].first, "inner");
   const lumo::object object(outer);
   EXPECT_EQ(lumo::dyn_cast_or_default(object.get("inner").get("text"), "other"), "t");
   for (const auto* const none : {&object.get("no"), &object.get("inner").get("text").get("no")}) {
