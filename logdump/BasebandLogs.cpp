@@ -43,11 +43,9 @@ lumo::dict DumpRequest(const LogdumpCommand& node, const std::list<std::string>&
   if (node.isSystemLogsTraceLite() || !defaults::compression::supported()) {
     mode = CompressionMode::none;
   }
-  lumo::dict request;
-  request.set(zub::kKeyTraceDumpStateReason, reason);
-  request.set(zub::kKeyTraceAction, zub::kCollectBasebandLogs);
-  request.set(zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode));
-  return request;
+  return {{zub::kKeyTraceDumpStateReason, reason},
+          {zub::kKeyTraceAction, zub::kCollectBasebandLogs},
+          {zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode)}};
 }
 
 /// The timestamp of the helper service's system report; empty when there is none.
@@ -57,8 +55,7 @@ std::string AskHelperForTimestamp() {
   if (!TelephonyUtilIsInternalBuild() && !TelephonyUtilIsCarrierBuild()) return {};
   const auto client = zub::HelperClient::create("logdump.helper", nullptr);
   if (!client) return {};
-  lumo::dict parameters;
-  parameters.set(zub::helper::kKeyTimeout, kTimeout);
+  const lumo::dict parameters = {{zub::helper::kKeyTimeout, kTimeout}};
   lumo::object reply = lumo::dict();
   const auto result =
       client->perform(kSystemReport, zub::helper::kCommandSysreportStatus, parameters, &reply);
@@ -88,9 +85,8 @@ void PrintHelperSuccess(bool qdss) {
 
 bool Collect(const LogdumpCommand& node, const std::list<std::string>& words) {
   constexpr auto kFailed = "Baseband log collection: Failed";
-  lumo::dict query;
-  query.set(zub::kKeyTraceName, zub::kTraceBaseband);
-  query.set(zub::kKeyTracePropertyName, zub::kKeyTraceEnabled);
+  const lumo::dict query = {{zub::kKeyTraceName, zub::kTraceBaseband},
+                            {zub::kKeyTracePropertyName, zub::kKeyTraceEnabled}};
   lumo::object property;
   const auto asked =
       zub::client::PerformCommand(node.manager, zub::kCommandGetTraceProperty, query, &property);

@@ -40,9 +40,8 @@ void LogdumpCommand::registerCommands() {
 
 bool LogdumpCommand::isSystemLogsTraceLite() const {
   constexpr std::int32_t kLite = 2;
-  lumo::dict request;
-  request.set(zub::kKeyTraceName, zub::kTraceSystemLogs);
-  request.set(zub::kKeyTracePropertyName, zub::kKeyTraceMode);
+  const lumo::dict request = {{zub::kKeyTraceName, zub::kTraceSystemLogs},
+                              {zub::kKeyTracePropertyName, zub::kKeyTraceMode}};
   lumo::object reply;
   zub::client::PerformCommand(manager, zub::kCommandGetTraceProperty, request, &reply);
   return ParseTraceMode(lumo::dyn_cast_or_default(reply.get(zub::kKeyTracePropertyValue), "")) ==

@@ -19,21 +19,17 @@ struct Collection {
 };
 
 lumo::dict TelephonyRequest(const std::string& reason, CompressionMode mode) {
-  lumo::dict request;
-  request.set(zub::kKeyTraceAction, zub::kCollectTelephonyLogs);
-  request.set(zub::kKeyTraceDumpStateReason, reason);
-  request.set(zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode));
-  return request;
+  return {{zub::kKeyTraceAction, zub::kCollectTelephonyLogs},
+          {zub::kKeyTraceDumpStateReason, reason},
+          {zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode)}};
 }
 
 lumo::dict CoredumpRequest(const std::string& reason, CompressionMode mode) {
-  lumo::dict request;
-  request.set(zub::kKeyBasebandResetType, zub::kBasebandResetTypeHard);
-  request.set(zub::kKeyBasebandResetSubType, zub::kBasebandResetSubTypeOtherErrors);
-  request.set(zub::kKeyTraceAction, zub::kCollectTelephonyLogsWithCoredump);
-  request.set(zub::kKeyBasebandResetReason, reason);
-  request.set(zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode));
-  return request;
+  return {{zub::kKeyBasebandResetType, zub::kBasebandResetTypeHard},
+          {zub::kKeyBasebandResetSubType, zub::kBasebandResetSubTypeOtherErrors},
+          {zub::kKeyTraceAction, zub::kCollectTelephonyLogsWithCoredump},
+          {zub::kKeyBasebandResetReason, reason},
+          {zub::kKeyTraceDumpStatePerformCompression, static_cast<std::int64_t>(mode)}};
 }
 
 constexpr Collection kTelephony = {"Telephony log collection: ", TelephonyRequest, true,

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <initializer_list>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -19,6 +20,11 @@ using entry = std::pair<std::string, object>;
 /// valid until the dictionary is changed or destroyed.
 class dict {
  public:
+  dict() = default;
+
+  /// Has `entries`, of which no two have the same key.
+  dict(std::initializer_list<entry> entries);
+
   /// Sets the value of `key`. A key that is set again keeps its place.
   void set(std::string_view key, object value);
 

@@ -12,6 +12,8 @@ const object& nullObject() {
 
 }  // namespace
 
+dict::dict(std::initializer_list<entry> entries) : items(entries) {}
+
 void dict::set(std::string_view key, object value) {
   const auto found = std::ranges::find(items, key, &entry::first);
   if (found != items.end()) {

@@ -33,10 +33,7 @@ class Client : public testing::Test {
 
 /// A request that only asks: for a property of a trace.
 lumo::dict propertyRequest(const char* property) {
-  lumo::dict request;
-  request.set(zub::kKeyTraceName, zub::kTraceSystemLogs);
-  request.set(zub::kKeyTracePropertyName, property);
-  return request;
+  return {{zub::kKeyTraceName, zub::kTraceSystemLogs}, {zub::kKeyTracePropertyName, property}};
 }
 
 TEST_F(Client, CompletesOnceOnTheQueueAndReleasesTheCompletionBeforeTheNextTask) {
@@ -82,12 +79,8 @@ TEST_F(Client, ReportsTheStateAnewOnTheQueueWhenEventsComeOn) {
 }
 
 TEST(Dictionary, KeepsTheOrderOfItsKeysAndReadsWhatIsMissingAsTheNullObject) {
-  lumo::dict inner;
-  inner.set("text", "t");
-  lumo::dict outer;
-  outer.set("inner", "old");
-  outer.set("a", true);
-  outer.set("inner", inner);
+  lumo::dict outer = {{"inner", "old"}, {"a", true}};
+  outer.set("inner", lumo::dict{{"text", "t"}});
   ASSERT_EQ(outer.entries().size(), 2);
   EXPECT_EQ(outer.entries()[0].first, "inner");
   const lumo::object object(outer);

@@ -87,8 +87,7 @@ class Manager {
 
  private:
   void reportState() {
-    lumo::dict payload;
-    payload.set(kKeyServerState, state);
+    lumo::dict payload = {{kKeyServerState, state}};
     const auto [first, last] = handlers.equal_range(kEventServerStateChange);
     for (auto handler = first; handler != last; ++handler) {
       queue.async([call = handler->second, payload]() mutable {
