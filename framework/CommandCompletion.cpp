@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <filesystem>
+#include <sstream>
 
 #include "framework/CommandBase.h"
 #include "framework/WordList.h"
@@ -28,12 +29,11 @@ char Closing(char opening) {
 /// Reads the brackets, angles and dashes in front of the description.
 Usage ReadUsage(const std::string& help) {
   Usage usage;
-  for (auto at = help.find_first_not_of(' '); at != std::string::npos;
-       at = help.find_first_not_of(' ', at)) {
-    const char kind = help[at];
-    if (kind != '[' && kind != '<' && kind != '-') break;
-    const auto end = std::min(help.find(Closing(kind), at), help.size());
-    auto text = help.substr(at + 1, end - at - 1);
+  std::istringstream rest(help);
+  char kind = 0;
+  while (rest >> kind && (kind == '[' || kind == '<' || kind == '-')) {
+    std::string text;
+    std::getline(rest, text, Closing(kind));
     if (kind == '-') {
       usage.options.push_back('-' + text);
     } else if (kind == '[' && text.find(' ') != std::string::npos) {
@@ -42,7 +42,6 @@ Usage ReadUsage(const std::string& help) {
       std::ranges::replace(text, '|', ' ');
       usage.options.splice(usage.options.end(), convertLineToList(text));
     }
-    at = std::min(end + 1, help.size());
   }
   return usage;
 }
