@@ -9,6 +9,7 @@
 #include "framework/CommandShell.h"
 #include "framework/WordList.h"
 #include "tests/CapturedOutput.h"
+#include "tests/FailingAllocations.h"
 #include "tests/Program.h"
 #include "tests/Table.h"
 
@@ -130,6 +131,8 @@ TEST(Shell, CompletesFromTheTreeAloneWithoutAsking) {
     EXPECT_EQ(offered, row[1] == " " ? "" : row[1]);
   });
   EXPECT_EQ(out.str(), "");
+  for (int nth = 1; failAllocation(nth, [&root] { root->complete("out 1 "); }); ++nth) {
+  }
 }
 
 TEST(Shell, NeedsATreeAndReadsWithTheReaderThatItIsGivenUntilThatHasNoTerminal) {
