@@ -11,11 +11,13 @@
 
 namespace {
 
-constexpr std::size_t kBufferSize = 8192;
-
-class InputBuffer final : public std::streambuf {
+/// Reads from a descriptor or writes to it, but not both. Drops what cannot be written, so that the
+/// stream stays good.
+class DescriptorBuffer final : public std::streambuf {
  public:
-  explicit InputBuffer(int source) : descriptor(source) {}
+  explicit DescriptorBuffer(int opened) : descriptor(opened) {
+    setp(buffer, buffer + sizeof buffer);
+  }
 
  protected:
   int_type underflow() override {
@@ -23,17 +25,6 @@ class InputBuffer final : public std::streambuf {
     return gptr() == egptr() ? traits_type::eof() : traits_type::to_int_type(*gptr());
   }
 
- private:
-  const int descriptor;
-  char buffer[kBufferSize];
-};
-
-/// Drops what cannot be written, so that the stream stays good.
-class OutputBuffer final : public std::streambuf {
- public:
-  explicit OutputBuffer(int target) : descriptor(target) { setp(buffer, buffer + sizeof buffer); }
-
- protected:
   int_type overflow(int_type byte) override {
     sync();
     if (!traits_type::eq_int_type(byte, traits_type::eof())) {
@@ -43,20 +34,16 @@ class OutputBuffer final : public std::streambuf {
   }
 
   int sync() override {
-    write({pbase(), static_cast<std::size_t>(pptr() - pbase())});
+    if (pptr() == pbase()) return 0;
+    posix::beforeOutput();
+    std::ignore = posix::writeAll(descriptor, {pbase(), pptr()});
     setp(buffer, buffer + sizeof buffer);
     return 0;
   }
 
  private:
-  void write(std::string_view bytes) {
-    if (bytes.empty()) return;
-    posix::beforeOutput();
-    std::ignore = posix::writeAll(descriptor, bytes);
-  }
-
   const int descriptor;
-  char buffer[kBufferSize];
+  char buffer[8192];
 };
 
 }  // namespace
@@ -68,8 +55,8 @@ void platform::openStandardStreams() {
   signal(SIGPIPE, SIG_IGN);
   signal(SIGXFSZ, SIG_IGN);
   // Never destroyed: other threads outlive exit, which flushes the output.
-  std::cin.rdbuf(new InputBuffer(STDIN_FILENO));
-  std::cout.rdbuf(new OutputBuffer(STDOUT_FILENO));
-  std::cerr.rdbuf(new OutputBuffer(STDERR_FILENO));
+  std::cin.rdbuf(new DescriptorBuffer(STDIN_FILENO));
+  std::cout.rdbuf(new DescriptorBuffer(STDOUT_FILENO));
+  std::cerr.rdbuf(new DescriptorBuffer(STDERR_FILENO));
   std::cerr.unsetf(std::ios::unitbuf);
 }
