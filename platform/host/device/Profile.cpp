@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <filesystem>
 #include <limits>
 #include <utility>
 
@@ -184,13 +185,6 @@ bool readPart(Text text, Profile& profile) {
   return read(text, profile.*Part);
 }
 
-/// `path`, taken from the folder of the profile `file`.
-std::string besideProfile(Text path, const std::string& file) {
-  const auto slash = file.rfind('/');
-  if (path.starts_with('/') || slash == std::string::npos) return std::string(path);
-  return file.substr(0, slash + 1).append(path);
-}
-
 struct Key {
   Text name;
   Text takes;  ///< the values, for a message
@@ -267,7 +261,9 @@ std::optional<std::string> parseProfile(std::string_view text, const std::string
     if (!wrong.empty())
       return (file + ":").append(std::to_string(number)).append(": ").append(wrong);
   }
-  if (profile.hasLogPath()) profile.log = besideProfile(profile.log, file);
+  if (profile.hasLogPath()) {
+    profile.log = std::filesystem::path(file).replace_filename(profile.log);
+  }
   return std::nullopt;
 }
 
