@@ -8,14 +8,9 @@ bool IsKOV() { return TelephonyRadiosGetRadioVendor() == kTelephonyRadioVendorKO
 
 /// The extension of an archive, or `defaultSuffix` if `mode` makes none.
 std::string ExtensionOf(CompressionMode mode, const std::string& defaultSuffix) {
-  switch (mode) {
-    case CompressionMode::tarGz:
-      return std::string(".") + zub::trace::kLogTarGzExtension;
-    case CompressionMode::tar:
-      return std::string(".") + zub::trace::kLogTarExtension;
-    default:
-      return defaultSuffix;
-  }
+  if (mode == CompressionMode::tarGz) return std::string(".") + zub::trace::kLogTarGzExtension;
+  if (mode == CompressionMode::tar) return std::string(".") + zub::trace::kLogTarExtension;
+  return defaultSuffix;
 }
 
 }  // namespace
