@@ -50,10 +50,6 @@ class membership {
   explicit membership(group entered) : joined(std::move(entered)) { joined.enter(); }
   membership(const membership& other) : membership(other.joined) {}
   membership(membership&& other) noexcept : joined(std::exchange(other.joined, group())) {}
-  membership& operator=(membership other) noexcept {
-    std::swap(joined, other.joined);
-    return *this;
-  }
   ~membership() { joined.leave(); }
 
  private:
@@ -109,14 +105,9 @@ class queue {
   /// no thread can be started, and `std::bad_alloc`.
   explicit queue(std::string label);
 
-  explicit operator bool() const noexcept { return worker != nullptr; }
-
   /// Appends `task`, which must not be empty, and returns at once. On `std::bad_alloc` the task
   /// does not run.
   void async(block<void()> task) const;
-
-  /// True when both refer to the same queue.
-  friend bool operator==(const queue&, const queue&) = default;
 
  private:
   struct Worker;
