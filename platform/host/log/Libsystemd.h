@@ -1,21 +1,23 @@
 #pragma once
 
+#include <dlfcn.h>
 #include <systemd/sd-journal.h>
 
 #include <stdexcept>
 
-#include "platform/host/SharedLibrary.h"
-
 namespace host {
 
 /// The functions of systemd's library that the host uses; sd-journal(3) describes them.
-struct Libsystemd : SharedLibrary {
+///
+/// The library is opened at its first use, and never closed. To link it would cost every start of
+/// the tool, and would leave no tool where the library is missing.
+class Libsystemd {
+  void* const handle = dlopen(ZUB_LIBSYSTEMD_NAME, RTLD_NOW | RTLD_LOCAL);  // initialized first
+
+ public:
   /// Throws `std::runtime_error` when the library is not there.
   static const Libsystemd& shared() {
     static const Libsystemd library;
-    if (!library.isThere()) {
-      throw std::runtime_error(ZUB_LIBSYSTEMD_NAME " cannot be loaded: is it installed?");
-    }
     return library;
   }
 
@@ -39,7 +41,23 @@ struct Libsystemd : SharedLibrary {
       find("sd_journal_seek_realtime_usec");
 
  private:
-  Libsystemd() : SharedLibrary(ZUB_LIBSYSTEMD_NAME) {}
+  /// An address that becomes a pointer to whatever function it is to be.
+  struct Symbol {
+    template <class Function>
+    operator Function*() const {
+      return reinterpret_cast<Function*>(address);
+    }
+
+    void* address;
+  };
+
+  Libsystemd() = default;
+
+  Symbol find(const char* name) const {
+    void* const found = handle != nullptr ? dlsym(handle, name) : nullptr;
+    if (found != nullptr) return {found};
+    throw std::runtime_error(ZUB_LIBSYSTEMD_NAME " cannot be loaded: is it installed?");
+  }
 };
 
 }  // namespace host
