@@ -35,7 +35,8 @@ std::optional<bool> readEditedLine(const std::string& prompt, const LineComplete
 /// Shows on the terminal that work is under way, from one second after this call on: a line that
 /// says for how long, and how many lines an export has written, brought up to date each second. It
 /// is gone when the result is released, or anything is to be written to std::cout or std::cerr (see
-/// openStandardStreams), or a signal ends or stops the process; none comes after that output.
+/// openStandardStreams) or to a file that is a terminal, or a signal ends or stops the process;
+/// none comes after that output.
 ///
 /// Empty, with nothing shown, where standard output or standard error is no terminal that can move
 /// its cursor, and where the system has too little for it. Nothing is shown in the background, nor

@@ -124,7 +124,7 @@ TEST(EditedLine, LeavesTheTerminalAsItWasWhateverSignalEndsIt) {
 class Terminal : public testing::Test {
  protected:
   void start(const std::string& term, const std::string& delay, const std::string& shell = "") {
-    const auto profile = "dump-timestamp = T\ndump-delay = " + delay;
+    const auto profile = "log-end = never\ndump-timestamp = T\ndump-delay = " + delay;
     program.emplace(Start{.profile = profile, .onTerminal = true, .term = term, .shell = shell});
     read(kPrompt);
   }
@@ -160,7 +160,7 @@ TEST_F(Terminal, IsAsItWasWhileACommandRuns) {
   expectEnd("\033[?2004l", 1);
 }
 
-TEST_F(Terminal, ShowsNothingOfWorkThatASignalEnds) {
+TEST_F(Terminal, ShowsNothingOfWorkThatASignalEndsOrThatWritesToIt) {
   for (const bool isStopped : {false, true}) {
     start("vt100", "60000");
     program->type(kTel + "a\r");
@@ -169,6 +169,12 @@ TEST_F(Terminal, ShowsNothingOfWorkThatASignalEnds) {
     kill(program->pid(), SIGTERM);
     expectEnd(isStopped ? "" : "\r\033[K", 1000 + SIGTERM);
   }
+  start("linux", "0");
+  program->type("logdump oslog 600 /dev/tty\r");
+  read("bars\n");
+  sleep(2);  // in which it would be shown among the lines
+  kill(program->pid(), SIGTERM);
+  expectEnd("", 1000 + SIGTERM);
 }
 
 TEST_F(Terminal, IsAsItWasWhileTheProgramIsStopped) {

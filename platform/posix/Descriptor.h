@@ -57,8 +57,8 @@ Descriptor openForAppending(const std::string& path, mode_t mode);
 /// How many times something was written to the files that FileHandle makes: lines, of an export.
 std::size_t linesWritten();
 
-/// Called before anything is written to standard output or standard error through the streams. The
-/// port defines it.
+/// Called before anything is written to standard output or standard error through the streams, and
+/// before a terminal is written to as a file. The port defines it.
 void beforeOutput();
 
 }  // namespace posix

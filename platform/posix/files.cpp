@@ -38,6 +38,7 @@ std::unique_ptr<FileHandle> FileHandle::createEmpty(const std::string& path) {
   constexpr mode_t kForItsOwner = 0600;
   auto opened = posix::openForAppending(path, kForItsOwner);
   if (!opened || !empty(opened)) return nullptr;
+  if (isatty(opened.get()) != 0) posix::beforeOutput();
   return std::make_unique<AppendedFile>(std::move(opened));
 }
 
