@@ -140,37 +140,28 @@ class OsLogStreamTest : public testing::Test, public OSLogEventStore, public OSL
 
 OsLogStreamTest* OsLogStreamTest::current = nullptr;
 
-TEST_F(OsLogStreamTest, TakesItsStepsInOrder) {
-  writeFile(output, "old");
+TEST_F(OsLogStreamTest, TakesItsStepsInOrderAsTheWordsOfTheCommandSay) {
+  writeFile(output, "");
   ASSERT_EQ(chmod(output.c_str(), 0640), 0);
-  const auto before = OSLogDate::now();
-  EXPECT_TRUE(OsLogStream::putOsLogStreamToFile(output, {"p1", "p2"}, {"I"}, 3600));
-  EXPECT_EQ(calls,
-            "prepare file:old\nflags 21 file:\n"
-            "filter process == %@ p1; process == %@ p2; senderImagePath CONTAINS[cd] %@ I; \n"
-            "event handler\ninvalidation handler\n"
-            "Getting oslog stream: history = 3600.000000\nactivate\n");
-  EXPECT_GE(start, before.addingSeconds(-3600));
-  EXPECT_LE(start, OSLogDate::now().addingSeconds(-3600));
-  EXPECT_EQ(readFile(output), line);
-  EXPECT_EQ(std::filesystem::status(output).permissions(), std::filesystem::perms(0640));
-}
-
-TEST_F(OsLogStreamTest, IsStartedByTheCommandWithItsWords) {
   forEachRow("oslog-command", 3, [this](const Row& row) {
     calls.clear();
-    std::filesystem::remove(output);
+    writeFile(output, "old");
+    const auto before = OSLogDate::now();
     auto words = convertLineToList(row[0]);
     std::ranges::replace(words, "OUT", output);
     const auto group = dispatch::group::create();
     EXPECT_TRUE(OsLogHandler()(group, words));
     EXPECT_TRUE(group.wait(0ns));
-    EXPECT_EQ(calls, "prepare file:\nflags 21 file:\n" + row[1] +
+    EXPECT_EQ(calls, "prepare file:old\nflags 21 file:\n" + row[1] +
                          "event handler\ninvalidation handler\n"
                          "Getting oslog stream: history = " +
                          row[2] + "\nactivate\n");
+    EXPECT_GE(start, before.addingSeconds(-std::stod(row[2])));
+    EXPECT_LE(start, OSLogDate::now().addingSeconds(-std::stod(row[2])));
     thread.join();
+    EXPECT_EQ(readFile(output), line);
   });
+  EXPECT_EQ(std::filesystem::status(output).permissions(), std::filesystem::perms(0640));
 }
 
 TEST_F(OsLogStreamTest, WritesOneLineForEachMessage) {
