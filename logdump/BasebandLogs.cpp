@@ -11,8 +11,6 @@
 
 namespace {
 
-using ManagerHandle = std::shared_ptr<zub::client::Manager>;
-
 void PrintLine(const std::string& line) { std::cout << line << std::endl; }
 
 void ReadFlag(const lumo::object& reply, bool& flag) {
@@ -21,7 +19,7 @@ void ReadFlag(const lumo::object& reply, bool& flag) {
 }
 
 /// Whether the baseband trace uses QDSS. `query` asks for another property of that trace.
-bool IsHighThroughputOn(const ManagerHandle& manager, lumo::dict query) {
+bool IsHighThroughputOn(const std::shared_ptr<zub::client::Manager>& manager, lumo::dict query) {
   bool on = false;
   if (!TelephonyCapabilitiesRadioDIAGSupportsQDSS()) return on;
   query.set(zub::kKeyTracePropertyName, zub::kKeyTraceHighTput);

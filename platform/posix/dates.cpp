@@ -7,8 +7,6 @@
 
 namespace {
 
-constexpr std::int64_t kMicrosecondsASecond = 1'000'000;
-
 /// The seconds of no date.
 constexpr std::time_t kNever = std::numeric_limits<std::time_t>::max();
 
@@ -27,7 +25,7 @@ OSLogDate OSLogDate::now() {
 OSLogDate OSLogDate::addingSeconds(double seconds) const {
   using Limits = std::numeric_limits<std::int64_t>;
   constexpr double kBeyond = 0x1p63;
-  const double added = std::round(seconds * static_cast<double>(kMicrosecondsASecond));
+  const double added = std::round(seconds * 1e6);
   if (std::isnan(added)) return *this;
   if (added >= kBeyond) return OSLogDate(Limits::max());
   if (added < -kBeyond) return OSLogDate(Limits::min());

@@ -25,7 +25,6 @@ group group::create() noexcept {
   try {
     made.state = std::make_shared<State>();
   } catch (const std::bad_alloc&) {  // the empty group says so
-    made.state = nullptr;
   }
   return made;
 }

@@ -4,7 +4,6 @@
 #include <csignal>
 #include <iostream>
 #include <streambuf>
-#include <tuple>
 
 #include "platform/posix/Descriptor.h"
 #include "platform/system.h"
@@ -36,7 +35,7 @@ class DescriptorBuffer final : public std::streambuf {
   int sync() override {
     if (pptr() == pbase()) return 0;
     posix::beforeOutput();
-    std::ignore = posix::writeAll(descriptor, {pbase(), pptr()});
+    static_cast<void>(posix::writeAll(descriptor, {pbase(), pptr()}));
     setp(buffer, buffer + sizeof buffer);
     return 0;
   }

@@ -1,7 +1,5 @@
 #pragma once
 
-#include <string>
-
 #include "platform/host/device/Profile.h"
 
 /// The device that this library simulates. A process has one.

@@ -6,7 +6,6 @@
 #include <mutex>
 #include <new>
 #include <thread>
-#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -75,8 +74,8 @@ class Manager {
     try {
       if (eventsOn) reportState();
     } catch (const std::bad_alloc&) {
-      std::ignore =
-          posix::writeAll(STDERR_FILENO, "Not enough memory for an event of the server\n");
+      static_cast<void>(
+          posix::writeAll(STDERR_FILENO, "Not enough memory for an event of the server\n"));
     }
   }
 

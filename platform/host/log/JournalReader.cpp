@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <new>
 #include <span>
 #include <stdexcept>
 #include <string>
