@@ -141,26 +141,19 @@ TelephonyLumo::Result answerTraceProperty(const lumo::dict& request, lumo::objec
   return {kNoSuchRequest, "no such trace property"};
 }
 
-/// A request, and whether the server ran when it arrived.
-struct Request {
-  std::string command;
-  lumo::dict entries;
-  bool serverRuns;
-};
-
-Request arrive(Manager& manager, const std::string& command, const lumo::dict& entries) {
-  host::recordRequest(command + " " + host::describe(entries));
-  return {command, entries, manager.isServerRunning()};
+/// Records a request. Returns whether the server runs when it arrives.
+bool arrive(Manager& manager, const std::string& command, const lumo::dict& request) {
+  host::recordRequest(command + " " + host::describe(request));
+  return manager.isServerRunning();
 }
 
 /// Answers a request, after the delay of a dump. Trace properties are settings of the device, and
 /// need no server.
-TelephonyLumo::Result answer(const Request& request, lumo::object* reply) {
-  if (request.command == kCommandGetTraceProperty) {
-    return answerTraceProperty(request.entries, reply);
-  }
-  if (!request.serverRuns) return {kResultServerNotRunning, "the server is not running"};
-  if (request.command != kCommandTraceDumpState) return {kNoSuchRequest, "no such command"};
+TelephonyLumo::Result answer(const std::string& command, const lumo::dict& request, bool serverRuns,
+                             lumo::object* reply) {
+  if (command == kCommandGetTraceProperty) return answerTraceProperty(request, reply);
+  if (!serverRuns) return {kResultServerNotRunning, "the server is not running"};
+  if (command != kCommandTraceDumpState) return {kNoSuchRequest, "no such command"};
   const auto& device = host::device();
   std::this_thread::sleep_for(device.dumpDelay);
   return host::answerWith(device.dump, kKeyTimestampString, host::timestampOr(device.dumpTimestamp),
@@ -200,24 +193,25 @@ void EventsOn(std::shared_ptr<Manager> manager) { manager->switchEvents(true); }
 
 TelephonyLumo::Result PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                                      const lumo::dict& request, lumo::object* reply) {
-  return answer(arrive(*manager, command, request), reply);
+  return answer(command, request, arrive(*manager, command, request), reply);
 }
 
 void PerformCommand(std::shared_ptr<Manager> manager, const std::string& command,
                     Completion completion, const lumo::dict& request) {
   const auto pending = std::make_shared<Pending>();
   pending->completion = std::move(completion);
-  manager->queue.async([manager, pending, arrived = arrive(*manager, command, request)] {
-    try {
-      pending->result = answer(arrived, &pending->reply);
-      // The states that the server has reported meanwhile come first.
-      manager->queue.async([pending] { pending->complete(); });
-    } catch (const std::bad_alloc&) {
-      pending->result = {kNoMemory, "no memory"};
-      pending->reply = {};
-      pending->complete();
-    }
-  });
+  manager->queue.async(
+      [manager, pending, command, request, serverRuns = arrive(*manager, command, request)] {
+        try {
+          pending->result = answer(command, request, serverRuns, &pending->reply);
+          // The states that the server has reported meanwhile come first.
+          manager->queue.async([pending] { pending->complete(); });
+        } catch (const std::bad_alloc&) {
+          pending->result = {kNoMemory, "no memory"};
+          pending->reply = {};
+          pending->complete();
+        }
+      });
 }
 
 }  // namespace client
