@@ -33,12 +33,12 @@ class LogStore : public testing::Test {
         });
     ASSERT_EQ(calls, 1) << "the completion runs before prepare returns";
     if (source == nullptr) GTEST_SKIP() << error;
-    stream = OSLogEventStream::initWithSource(source);
+    renew();
     ASSERT_NE(stream, nullptr);
   }
 
   /// Runs the stream and calls `each` with every event, until there are no more or `each` has seen
-  /// what a log of any length has enough of.
+  /// what a log of any length has enough of. Then there is another stream.
   std::vector<Event> run(OSLogDate from, const std::function<void()>& each = nullptr) {
     std::vector<Event> events;
     runToItsEnd(*stream, from, [&](const OSLogEventProxy& event) {
@@ -51,6 +51,8 @@ class LogStore : public testing::Test {
       events.push_back(
           {event.date(), std::string(event.process()), std::string(event.composedMessage())});
     });
+    stream->invalidate();  // after its end
+    renew();
     return events;
   }
 
@@ -70,29 +72,22 @@ TEST_F(LogStore, DeliversInOrderFromTheDateOnWhatAnyTermOfTheFilterLetsPass) {
   const auto count = std::ranges::count(all, wanted, &Event::process);
   const OSLogDate middle = all[all.size() / 2].date;
   std::erase_if(all, [middle](const Event& event) { return event.date < middle; });
-  renew();
   const auto later = run(middle);
   ASSERT_GE(later.size(), all.size());
   for (std::size_t i = 0; i < all.size(); ++i) EXPECT_EQ(later[i].message, all[i].message);
-  renew();
   stream->setFilterPredicate({{{"process == %@", "none"}, {"process == %@", wanted}}});
   const auto some = run(tenMinutesAgo);
   EXPECT_GE(some.size(), static_cast<std::size_t>(count));
   EXPECT_TRUE(std::ranges::all_of(some, [&](const auto& one) { return one.process == wanted; }));
-  renew();
   stream->setFilterPredicate({});
   EXPECT_TRUE(run(tenMinutesAgo).empty()) << "no term is true";
-  renew();
   EXPECT_THROW(stream->setFilterPredicate({{{"pid == %@", "1"}}}), std::invalid_argument);
 }
 
 TEST_F(LogStore, IsInvalidatedFromAnywhereAndRunsOnWhenItsMakerReleasesIt) {
   run(tenMinutesAgo, [this] { stream->invalidate(); });  // from its own thread, again and again
-  stream->invalidate();                                  // after its end
-  renew();
   stream->invalidate();
   EXPECT_TRUE(run(tenMinutesAgo).empty()) << "invalidated before it was activated";
-  renew();
   const auto ended = dispatch::group::create();
   stream->setInvalidationHandler([member = dispatch::membership(ended)](auto, const auto&) {});
   stream->activateStreamFromDate(tenMinutesAgo);
