@@ -14,8 +14,8 @@ constexpr std::uint64_t kStreamFlags = 21;  // the bits are the log store's
 
 using StreamHandle = std::shared_ptr<OSLogEventStream>;
 
-/// The file of one export. Lines come from the store's thread, and may still come when the export
-/// is over: a closed file takes none.
+/// The file of one export. The store's thread may still append lines when the export is over: a
+/// closed file takes none.
 class LineFile {
  public:
   explicit LineFile(std::unique_ptr<platform::FileHandle> opened) : file(std::move(opened)) {}
@@ -55,13 +55,14 @@ class LineFile {
   std::atomic<bool> failed = false;
 };
 
-/// Prepares the local store. Empty, and the reason in the system log, when that fails.
+/// Prepares the local store. Returns an empty pointer, with the reason in the system log, when that
+/// fails.
 StreamHandle PrepareStream() {
   struct Outcome {
     std::mutex mutex;
     StreamHandle stream;
   };
-  // Shared with the handler: one that is called too late after all finds nobody waiting.
+  // Shared with the handler, so that one which is called too late writes to what still exists.
   const auto outcome = std::make_shared<Outcome>();
   OSLogEventStore::localStore()->prepareWithCompletionHandler(
       [outcome](const std::shared_ptr<OSLogEventSource>& source,

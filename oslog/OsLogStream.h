@@ -18,9 +18,10 @@ class OsLogStream {
   /// contains one of `imagePath`, whatever case and accents; every message when both lists are
   /// empty. Blocks until the log has been copied, or 180 seconds have passed.
   ///
-  /// True when the log store ended the stream in time; it may have ended it early, which it says in
-  /// the system log. False, and the reason in the system log, when the log or the file cannot be
-  /// opened, a line cannot be written whole, or the time is up; lines written until then stay.
+  /// Returns true when the log store ended the stream in time; the system log has the reason if
+  /// that was before the end of the log. Returns false, with the reason in the system log, when the
+  /// log or the file cannot be opened, a line cannot be written whole, or the time is up; lines
+  /// written until then stay.
   /// Threads: any; a call keeps nothing for the next.
   [[nodiscard]] static bool putOsLogStreamToFile(const std::string& path,
                                                  const std::list<std::string>& process,

@@ -6,8 +6,7 @@
 
 /// The telephony utility library, which describes the device.
 ///
-/// Threads: any. No function fails: a code that the device does not know is 0, any other answer
-/// false.
+/// Threads: any. No function fails: for what the device does not know, each returns 0 or false.
 
 /// The products that the tool knows by name. The codes are those of the device's services; those of
 /// the watches follow one another.

@@ -59,8 +59,8 @@ inline constexpr auto kResultServerNotRunning = static_cast<std::int32_t>(0xE020
 /// The client library of the baseband manager server.
 ///
 /// Threads: handlers and completions run on the queue that the manager was made with, one at a
-/// time. They must not throw. Errors: those of a request are in its result, which is a failure too
-/// when there is no memory for the answer; an event for which there is none is lost. A call for
+/// time. They must not throw. Errors: a request that fails has the error in its result, also when
+/// there is no memory for the answer. An event for which there is no memory is lost. A call for
 /// which there is no memory or no thread throws `std::bad_alloc` or `std::system_error`.
 namespace zub::client {
 

@@ -21,7 +21,7 @@ constexpr int kCannotStart = -1;  // status 255
   std::exit(kCannotStart);
 }
 
-/// What the main thread passes to the shell thread, and which outlives that.
+/// What the main thread passes to the shell thread. It outlives that thread.
 struct Start {
   std::list<std::string> words;  ///< of the command line
   sigset_t signals{};            ///< blocked when the process was started

@@ -54,7 +54,7 @@ Descriptor openForAppending(const std::string& path, mode_t mode);
 /// error counts as the end.
 [[nodiscard]] std::size_t readSome(int descriptor, char* buffer, std::size_t size);
 
-/// How many times something was written to the files that FileHandle makes: lines, of an export.
+/// How many writes the files of FileHandle have had. An export makes one for each line.
 std::size_t linesWritten();
 
 /// Called before anything is written to standard output or standard error through the streams, and

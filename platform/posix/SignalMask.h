@@ -4,8 +4,8 @@
 
 namespace posix {
 
-/// Gives the calling thread another mask of blocked signals while this lives, and the threads that
-/// it starts meanwhile for good.
+/// Changes the calling thread's mask of blocked signals while it lives. A thread that is started
+/// meanwhile keeps the changed mask.
 class SignalMask {
  public:
   /// Blocks all signals but those that report a fault of the thread itself.

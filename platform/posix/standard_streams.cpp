@@ -10,8 +10,8 @@
 
 namespace {
 
-/// Reads from a descriptor or writes to it, but not both. Drops what cannot be written, so that the
-/// stream stays good.
+/// Reads from a descriptor or writes to it, but not both. Output that cannot be written is dropped,
+/// so that the stream stays good.
 class DescriptorBuffer final : public std::streambuf {
  public:
   explicit DescriptorBuffer(int opened) : descriptor(opened) {

@@ -21,7 +21,7 @@ struct Answer {
   friend bool operator==(const Answer&, const Answer&) = default;
 };
 
-/// The server reports `state` when the manager is `at` old.
+/// The server reports `state` when `at` has passed since the manager was made.
 struct ServerStep {
   std::chrono::milliseconds at;
   std::string state;

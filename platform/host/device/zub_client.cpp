@@ -160,7 +160,7 @@ TelephonyLumo::Result answer(const std::string& command, const lumo::dict& reque
                           reply);
 }
 
-/// The completion of a request and what it takes. The call destroys it, not the end of the task.
+/// The completion of a request and its arguments. `complete` calls and destroys the completion.
 struct Pending {
   Completion completion;
   TelephonyLumo::Result result;
