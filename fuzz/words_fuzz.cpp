@@ -7,8 +7,8 @@
 #include <cstdlib>
 #include <sstream>
 
-#include "framework/CommandBase.h"
 #include "framework/WordList.h"
+#include "fuzz/Node.h"
 
 namespace {
 
@@ -16,28 +16,20 @@ void require(bool holds) {
   if (!holds) std::abort();
 }
 
-/// A node with a child of its kind, and with options but no files to complete.
-class Node : public CommandBase {
- public:
-  static std::shared_ptr<CommandBase> create(const std::string& name,
-                                             std::weak_ptr<CommandBase> parent) {
-    std::shared_ptr<CommandBase> node(new Node(name, std::move(parent)));
-    node->init();
-    return node;
+/// A node and its child, with options but no files to complete.
+std::shared_ptr<Node> createTree() {
+  auto root = Node::create("root", {});
+  const auto dump = Node::create("dump", root);
+  root->addSubCommand("dump", dump);
+  for (const auto& node : {root, dump}) {
+    node->handler("tel", true, "[nocompress|tar.gz|tar] [nonui] <reason> collect logs");
+    node->handler("log", true, "[history size] -p <a b..> -i <c d..> export logs");
   }
-
- private:
-  using CommandBase::CommandBase;
-  void registerCommands() override {
-    const auto nothing = [](const dispatch::group&, const std::list<std::string>&) { return true; };
-    addCommandHandler("tel", nothing, "[nocompress|tar.gz|tar] [nonui] <reason> collect logs");
-    addCommandHandler("log", nothing, "[history size] -p <a b..> -i <c d..> export logs");
-    if (!getParent().lock()) addSubCommand("dump", create("dump", weak_from_this()));
-  }
-};
+  return root;
+}
 
 void requireCompletion(const std::string& line) {
-  static const auto root = Node::create("root", {});
+  static const auto root = createTree();
   auto last = convertLineToList(line + '.').front();
   last.pop_back();
   for (const auto& [word, note] : root->complete(line)) {
