@@ -94,7 +94,7 @@ TEST_F(LogStore, IsInvalidatedFromAnywhereAndRunsOnWhenItsMakerReleasesIt) {
   stream.reset();
   EXPECT_TRUE(ended.wait(std::chrono::seconds(60)));
   renew();
-  const std::jthread other([this] { stream->invalidate(); });
+  const std::jthread other([last = stream] { last->invalidate(); });
   run(tenMinutesAgo);
 }
 
