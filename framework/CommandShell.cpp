@@ -13,7 +13,6 @@ std::list<std::string> CommandShell::convertCmdArgsToList(int argc, const char* 
 bool CommandShell::run(std::list<std::string> words) {
   rootCommand = createRootCommand();
   if (!rootCommand) return false;
-  currentCommand = rootCommand;
   if (!words.empty()) words.pop_back();
   if (!words.empty()) return runBatch(words) != Outcome::failed;
   promptCommand = rootCommand;
@@ -23,7 +22,6 @@ bool CommandShell::run(std::list<std::string> words) {
 /// Prompts and runs lines until one of them quits or, which is a failure, none can be read.
 CommandShell::Outcome CommandShell::runLines() {
   for (;;) {
-    currentCommand = promptCommand;
     std::string line;
     if (!readLine(line)) return Outcome::failed;
     if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
@@ -47,10 +45,9 @@ bool CommandShell::readLine(std::string& line) const {
 /// Runs the groups of `words` until one does not succeed.
 CommandShell::Outcome CommandShell::runBatch(const std::list<std::string>& words) {
   for (auto& group : splitCmdList(words)) {
-    const auto outcome = runGroup(std::move(group));
-    if (outcome == Outcome::quit) return outcome;
     currentCommand = promptCommand ? promptCommand : rootCommand;
-    if (outcome == Outcome::failed) return outcome;
+    const auto outcome = runGroup(std::move(group));
+    if (outcome != Outcome::succeeded) return outcome;
   }
   return Outcome::succeeded;
 }
