@@ -1,18 +1,14 @@
-#include <poll.h>
-#include <sys/eventfd.h>
 #include <sys/ioctl.h>
-#include <sys/signalfd.h>
 #include <termios.h>
 #include <unistd.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <memory>
 #include <mutex>
+#include <stop_token>
 #include <string>
-#include <system_error>
 #include <thread>
 #include <tuple>
 
@@ -23,7 +19,10 @@
 
 namespace {
 
+using namespace std::chrono_literals;
 using std::chrono::steady_clock;
+
+constexpr int kWaking = SIGURG;  // has no effect but on the thread that awaits it
 
 // Of the work under way, of which there is one at a time.
 std::mutex gMutex;
@@ -64,33 +63,31 @@ std::string describe(std::chrono::seconds time, std::size_t lines) {
 class WorkLine {
  public:
   WorkLine() {
-    sigemptyset(&ending);
-    for (const int signal : host::endingSignals()) sigaddset(&ending, signal);
-    signals = posix::Descriptor(signalfd(-1, &ending, SFD_CLOEXEC | SFD_NONBLOCK));
-    over = posix::Descriptor(eventfd(0, EFD_CLOEXEC));
-    if (!signals || !over) throw std::system_error(errno, std::generic_category());
+    sigemptyset(&awaited);
+    sigaddset(&awaited, kWaking);
+    for (const int signal : host::endingSignals()) sigaddset(&awaited, signal);
     gMayShow = true;
-    thread = std::thread([this] { run(); });
+    thread = std::jthread([this](const std::stop_token& over) { run(over); });
   }
   WorkLine(const WorkLine&) = delete;
   WorkLine& operator=(const WorkLine&) = delete;
   ~WorkLine() {
     stopShowing();
-    eventfd_write(over.get(), 1);
-    thread.join();
+    thread.request_stop();
+    pthread_kill(thread.native_handle(), kWaking);
   }
 
  private:
-  void run() const {
-    pollfd ready[] = {{over.get(), POLLIN, 0}, {signals.get(), POLLIN, 0}};
-    for (auto next = begin + std::chrono::seconds(1);;) {
-      const auto left = std::chrono::ceil<std::chrono::milliseconds>(next - steady_clock::now());
-      ::poll(ready, 2, static_cast<int>(std::max<long>(left.count(), 0)));
-      if (ready[0].revents != 0) return;
-      if (ready[1].revents != 0) takeSignal();
+  void run(const std::stop_token& over) const {
+    for (auto next = begin + 1s;;) {
+      const std::chrono::nanoseconds left = std::max(next - steady_clock::now(), {});
+      const timespec limit = {left / 1s, left % 1s / 1ns};
+      const int signal = sigtimedwait(&awaited, nullptr, &limit);
+      if (signal == kWaking && over.stop_requested()) return;
+      if (signal > 0) take(signal);
       if (steady_clock::now() < next) continue;
       draw();
-      next += std::chrono::seconds(1);
+      next += 1s;
     }
   }
 
@@ -110,21 +107,17 @@ class WorkLine {
 
   /// Has a signal do what it does by default, at once: it never waits for a terminal that Ctrl-S
   /// has stopped, nor for a thread that does.
-  void takeSignal() const {
-    signalfd_siginfo taken{};
-    if (::read(signals.get(), &taken, sizeof taken) != sizeof taken) return;
+  void take(int signal) const {
     const std::unique_lock lock(gMutex, std::try_to_lock);
     if (lock && host::takesOutput(STDOUT_FILENO)) clear();
-    host::takeEffect(static_cast<int>(taken.ssi_signo));
+    host::takeEffect(signal);
   }
 
   const steady_clock::time_point begin = steady_clock::now();
   const std::size_t linesBefore = posix::linesWritten();
   const posix::SignalMask here;  // and on the thread
-  sigset_t ending{};
-  posix::Descriptor signals;
-  posix::Descriptor over;
-  std::thread thread;
+  sigset_t awaited{};
+  std::jthread thread;
 };
 
 }  // namespace
