@@ -52,10 +52,8 @@ bool isWhole(std::string_view key) {
 /// What `candidates` have in common at their start, in whole characters.
 std::string commonStart(const Candidates& candidates) {
   const auto& first = candidates.begin()->first;
-  std::string common = first;
-  for (const auto& [word, note] : candidates) {
-    common.erase(std::ranges::mismatch(common, word).in1, common.end());
-  }
+  const auto& last = candidates.rbegin()->first;  // the least alike, for they are sorted
+  std::string common(first.begin(), std::ranges::mismatch(first, last).in1);
   if (posix::isUtf8(first)) {
     while (!posix::isUtf8(common)) common.pop_back();
   }
@@ -73,7 +71,9 @@ struct Memory {
 class Editor {
  public:
   Editor(Memory& memory, const std::string& prompt, const platform::LineCompleter& complete)
-      : memory(memory), prompt(prompt), complete(complete), place(memory.history.size()) {}
+      : memory(memory), prompt(prompt), complete(complete) {
+    lines.emplace_back();
+  }
 
   /// True for a line, false at the end of the input.
   bool read(std::string& result) {
@@ -156,7 +156,7 @@ class Editor {
         {"\x19", [](Editor& e) { e.line.insert(e.memory.killed); }},
         {"\x14", [](Editor& e) { e.line.transpose(); }},
         {"\x10 \033[A", [](Editor& e) { e.show(e.place > 0 ? e.place - 1 : 0); }},
-        {"\x0E \033[B", [](Editor& e) { e.show(std::min(e.place + 1, e.memory.history.size())); }},
+        {"\x0E \033[B", [](Editor& e) { e.show(std::min(e.place + 1, e.lines.size() - 1)); }},
         {kCtrlR, [](Editor& e) { e.search(); }},
         {"\t", [](Editor& e) { e.completeWord(); }},
         {"\x0C", [](Editor& e) { e.clearScreen(); }},
@@ -230,16 +230,10 @@ class Editor {
     memory.pasted.erase(0, end + 1);
   }
 
-  /// The line at `index` of the history, as it has been edited.
-  const std::string& lineAt(std::size_t index) const {
-    const auto draft = drafts.find(index);
-    return draft != drafts.end() ? draft->second : memory.history[index];
-  }
-
   void show(std::size_t newPlace) {
-    drafts[place] = line.text();
+    lines[place] = line.text();
     place = newPlace;
-    line.set(lineAt(place));
+    line.set(lines[place]);
   }
 
   void search() {
@@ -256,10 +250,10 @@ class Editor {
     } else if (isOneOf(kBackspace, key)) {
       wanted->erase(left);
       show(placeBefore);
-      find(memory.history.size());
+      find(lines.size() - 1);
     } else if (isText(key)) {
       wanted->insert(key);
-      find(std::min(place + 1, memory.history.size()));
+      find(std::min(place + 1, lines.size() - 1));
     } else {
       wanted.reset();
       if (key == kCtrlG) show(placeBefore);
@@ -271,7 +265,7 @@ class Editor {
   /// Goes to the newest line before `end` that holds what is wanted; stays where there is none.
   void find(std::size_t end) {
     while (!wanted->text().empty() && end-- > 0) {
-      const auto found = lineAt(end).find(wanted->text());
+      const auto found = lines[end].find(wanted->text());
       if (found == std::string::npos) continue;
       show(end);
       return line.set(line.text(), found);
@@ -321,13 +315,13 @@ class Editor {
   TerminalSession session;
   host::LineDisplay display{session};
   EditedLine line;
-  std::size_t place;                          // in the history; after its end, the new line
-  std::map<std::size_t, std::string> drafts;  // lines of the history, and the new one, as edited
-  std::optional<EditedLine> wanted;           // by the search that is under way
-  std::size_t placeBefore = 0;                // that search
-  bool hasKilled = false;                     // the last key
-  bool hadKilled = false;                     // and the one before
-  std::optional<bool> isLine;                 // how the editing has ended
+  std::vector<std::string> lines = memory.history;  // and the new one, as they have been edited
+  std::size_t place = lines.size();                 // of the line in the editor
+  std::optional<EditedLine> wanted;                 // by the search that is under way
+  std::size_t placeBefore = 0;                      // that search
+  bool hasKilled = false;                           // the last key
+  bool hadKilled = false;                           // and the one before
+  std::optional<bool> isLine;                       // how the editing has ended
 };
 
 }  // namespace
