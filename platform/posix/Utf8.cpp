@@ -6,6 +6,7 @@ namespace posix {
 namespace {
 
 constexpr char32_t kReplacement = 0xFFFD;
+constexpr std::string_view kReplacementText = "\xEF\xBF\xBD";
 
 struct Sequence {
   std::size_t length;
@@ -70,7 +71,11 @@ bool isUtf8(std::string_view text) {
 std::string_view asUtf8(std::string_view text, std::string& storage) {
   if (isUtf8(text)) return text;
   storage.clear();
-  while (!text.empty()) appendUtf8(storage, takeCodePoint(text));
+  while (!text.empty()) {
+    const Sequence sequence = firstSequence(text);
+    storage += sequence.wellFormed ? text.substr(0, sequence.length) : kReplacementText;
+    text.remove_prefix(sequence.length);
+  }
   return storage;
 }
 
@@ -78,21 +83,6 @@ char32_t takeCodePoint(std::string_view& text) {
   const Sequence sequence = firstSequence(text);
   text.remove_prefix(sequence.length);
   return sequence.code;
-}
-
-void appendUtf8(std::string& text, char32_t codePoint) {
-  const auto tail = [codePoint](unsigned shift) {
-    return static_cast<char>(0x80U | ((codePoint >> shift) & 0x3FU));
-  };
-  if (codePoint < 0x80) {
-    text += static_cast<char>(codePoint);
-  } else if (codePoint < 0x800) {
-    text += {static_cast<char>(0xC0U | (codePoint >> 6)), tail(0)};
-  } else if (codePoint < 0x10000) {
-    text += {static_cast<char>(0xE0U | (codePoint >> 12)), tail(6), tail(0)};
-  } else {
-    text += {static_cast<char>(0xF0U | (codePoint >> 18)), tail(12), tail(6), tail(0)};
-  }
 }
 
 }  // namespace posix

@@ -28,7 +28,4 @@ std::size_t utf8Length(char lead);
 /// ill-formed sequence, divided as above.
 char32_t takeCodePoint(std::string_view& text);
 
-/// Appends `codePoint`, which must be one that UTF-8 can encode.
-void appendUtf8(std::string& text, char32_t codePoint);
-
 }  // namespace posix

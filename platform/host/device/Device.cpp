@@ -45,14 +45,16 @@ Profile* loadProfile() {
 }  // namespace
 
 void complain(std::string_view message) {
+  std::string repaired;
   std::string shown;
-  while (!message.empty()) {
-    const char32_t code = posix::takeCodePoint(message);
+  for (auto rest = posix::asUtf8(message, repaired); !rest.empty();) {
+    const auto before = rest;
+    const char32_t code = posix::takeCodePoint(rest);
     if (code < 0x20 || (code >= 0x7F && code < 0xA0)) {
       constexpr auto kDigits = "0123456789abcdef";
       shown.append("\\x") += {kDigits[code / 16], kDigits[code % 16]};
     } else {
-      posix::appendUtf8(shown, code);
+      shown += before.substr(0, before.size() - rest.size());
     }
   }
   static_cast<void>(posix::writeAll(STDERR_FILENO, shown + '\n'));

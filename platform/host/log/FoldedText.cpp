@@ -54,11 +54,11 @@ char32_t baseLetter(char32_t code) {
   return outside == kOutside.npos ? code : kOutsideBase[outside];
 }
 
-std::string fold(std::string_view text) {
-  std::string folded;
+std::u32string fold(std::string_view text) {
+  std::u32string folded;
   while (!text.empty()) {
     const char32_t code = posix::takeCodePoint(text);
-    if (code < kFirstMark || code > kLastMark) posix::appendUtf8(folded, baseLetter(code));
+    if (code < kFirstMark || code > kLastMark) folded += baseLetter(code);
   }
   return folded;
 }
@@ -69,9 +69,11 @@ FoldedText::FoldedText(std::string_view text) : folded(fold(text)) {}
 
 bool FoldedText::isIn(std::string_view text) const {
   const auto ascii = [](char byte) { return isAscii(static_cast<unsigned char>(byte)); };
-  if (!std::ranges::all_of(text, ascii)) return fold(text).find(folded) != std::string::npos;
+  if (!std::ranges::all_of(text, ascii)) return fold(text).find(folded) != folded.npos;
   // Nearly every path: compared in place.
-  const auto same = [](char theirs, char ours) { return posix::lowered(theirs) == ours; };
+  const auto same = [](char theirs, char32_t ours) {
+    return baseLetter(static_cast<unsigned char>(theirs)) == ours;
+  };
   return folded.empty() ||
          std::search(text.begin(), text.end(), folded.begin(), folded.end(), same) != text.end();
 }

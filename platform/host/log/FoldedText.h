@@ -22,7 +22,7 @@ class FoldedText {
   bool isIn(std::string_view text) const;
 
  private:
-  std::string folded;
+  std::u32string folded;
 };
 
 }  // namespace host
