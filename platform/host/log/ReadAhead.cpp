@@ -35,21 +35,18 @@ bool ReadAhead::next() {
 
 void ReadAhead::run(const Open& open, const Wanted& wanted) {
   try {
-    readLog(*open(), wanted);
+    const auto reader = open();
+    reader->callBeforeWaiting([this] {
+      if (!filling->events.empty()) handOver();
+    });
+    while (reader->next()) {
+      if (wanted(reader->entry())) add(reader->entry());
+    }
   } catch (...) {
     filling->failure = std::current_exception();
   }
   filling->last = true;
   handOver();
-}
-
-void ReadAhead::readLog(EntryReader& reader, const Wanted& wanted) {
-  reader.callBeforeWaiting([this] {
-    if (!filling->events.empty()) handOver();
-  });
-  while (reader.next()) {
-    if (wanted(reader.entry())) add(reader.entry());
-  }
 }
 
 void ReadAhead::add(const LogEntry& entry) {

@@ -58,7 +58,6 @@ class ReadAhead {
   };
 
   void run(const Open& open, const Wanted& wanted);
-  void readLog(EntryReader& reader, const Wanted& wanted);
   void add(const LogEntry& entry);
   void handOver();
   void takeOver();

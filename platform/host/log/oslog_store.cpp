@@ -49,11 +49,9 @@ unsigned long deliverEvents(const Delivery& delivery) {
 }
 
 /// Writes to the system log why the log was not read to its end.
-void report(const char* why) noexcept {
-  try {
-    platform::logError(std::string("Log not read to its end: ") + why);
-  } catch (const std::bad_alloc&) {  // the reason code has to do
-  }
+void report(const char* why) noexcept try {
+  platform::logError(std::string("Log not read to its end: ") + why);
+} catch (const std::bad_alloc&) {  // the reason code has to do
 }
 
 /// Ends a stream. Nothing of it is left when the invalidation handler runs.
