@@ -50,7 +50,7 @@ int main(int argc, char** argv) {
   platform::openStandardStreams();
   Start start{CommandShell::convertCmdArgsToList(argc, argv)};
   if (const char* const why = WhyNotToStart()) {
-    std::cout << why << '\n';
+    std::cout << why << std::endl;
     return kCannotStart;
   }
   std::set_new_handler(nullptr);  // from here on it is an exception
