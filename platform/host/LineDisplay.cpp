@@ -11,32 +11,24 @@ struct Place {
   std::size_t column;
 };
 
-/// Where the cells of a text stand, in rows of a number of columns.
-struct Layout {
-  Layout(const std::vector<Cell>& cells, std::size_t columns) : cells(cells) {
-    std::size_t column = 0;
-    for (std::size_t i = 0; i < cells.size(); ++i) {
-      if (column > 0 && column + cells[i].columns > columns) {
-        starts.push_back(i);
-        column = 0;
-      }
-      column += cells[i].columns;
-    }
-    endsRow = column >= columns;
+/// Where each of `cells` stands in rows of `columns`, and at last what comes after them. Where they
+/// fill a row, that is at its end.
+std::vector<Place> placesOf(const std::vector<Cell>& cells, std::size_t columns) {
+  std::vector<Place> places;
+  Place next = {0, 0};
+  for (const auto& cell : cells) {
+    if (next.column > 0 && next.column + cell.columns > columns) next = {next.row + 1, 0};
+    places.push_back(next);
+    next.column += cell.columns;
   }
+  places.push_back(next);
+  return places;
+}
 
-  /// The place of the cell at `index`, or of what comes after them all.
-  Place placeOf(std::size_t index) const {
-    const auto next = std::ranges::upper_bound(starts, index);
-    Place place = {static_cast<std::size_t>(next - starts.begin()) - 1, 0};
-    for (auto i = *std::prev(next); i < index; ++i) place.column += cells[i].columns;
-    return place;
-  }
-
-  const std::vector<Cell>& cells;
-  std::vector<std::size_t> starts = {0};  // of each row, its first cell
-  bool endsRow;                           // the last row is full
-};
+/// The first of `places` that is in `row`.
+std::ptrdiff_t startOf(std::size_t row, const std::vector<Place>& places) {
+  return std::ranges::lower_bound(places, row, {}, &Place::row) - places.begin();
+}
 
 std::string control(std::size_t count, char function) {
   return count > 0 ? "\033[" + std::to_string(count) + function : "";
@@ -56,36 +48,37 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
   const auto [height, columns] = sizeOfTerminal();
   auto cells = cellsOf(text);
   auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
-  if (Layout(cells, columns).endsRow) cells.push_back({" ", 1});  // what the cursor stands on
+  // The cursor after a full row stands on a cell of its own.
+  if (placesOf(cells, columns).back().column >= columns) cells.push_back({" ", 1});
   auto same = static_cast<std::size_t>(std::ranges::mismatch(drawn, cells).in1 - drawn.begin());
-  if (const Layout all(cells, columns); all.starts.size() > height) {
-    const auto last = std::max(all.placeOf(at).row + 1, height);
-    const auto first = all.starts[last - height];
-    if (last < all.starts.size()) cells.resize(all.starts[last]);
-    cells.erase(cells.begin(), cells.begin() + static_cast<std::ptrdiff_t>(first));
-    at -= first;
+  if (const auto all = placesOf(cells, columns); all.back().row >= height) {
+    const auto end = std::max(all[at].row + 1, height);
+    const auto first = startOf(end - height, all);
+    if (end <= all.back().row) cells.erase(cells.begin() + startOf(end, all), cells.end());
+    cells.erase(cells.begin(), cells.begin() + first);
+    at -= static_cast<std::size_t>(first);
     same = 0;
   }
 
-  const Layout before(drawn, columns);
-  const Layout now(cells, columns);
-  const Place start = before.placeOf(same);
-  std::string output = drawn.empty() ? "\r" : moving(before.placeOf(drawnCursor), start);
+  const auto before = placesOf(drawn, columns);
+  const auto now = placesOf(cells, columns);
+  const Place start = before[same];
+  std::string output = drawn.empty() ? "\r" : moving(before[drawnCursor], start);
   if (drawn.empty() || same < drawn.size()) {
     // tmux takes a row that is cleared from its first column on for a line of its own, and keeps
     // the whole screen as history.
     output += start.column > 0 ? "\033[J" : " \033[J\r";
   }
   for (auto i = same; i < cells.size(); ++i) output += cells[i].glyph;
-  output += moving(now.placeOf(cells.size()), now.placeOf(at));
+  output += moving(now.back(), now[at]);
   session.write(output);
   drawn = std::move(cells);
   drawnCursor = at;
 }
 
 void LineDisplay::clear() {
-  const Layout rows(drawn, sizeOfTerminal().columns);
-  session.write(moving(rows.placeOf(drawnCursor), {0, 0}));
+  const auto places = placesOf(drawn, sizeOfTerminal().columns);
+  session.write(moving(places[drawnCursor], {0, 0}));
   forget();
 }
 
@@ -95,9 +88,9 @@ void LineDisplay::forget() {
 }
 
 void LineDisplay::append(std::string_view text) {
-  const Layout rows(drawn, sizeOfTerminal().columns);
-  const Place lastRow = {rows.starts.size() - 1, 0};
-  session.write(moving(rows.placeOf(drawnCursor), lastRow) + "\r\n" + std::string(text));
+  const auto places = placesOf(drawn, sizeOfTerminal().columns);
+  const Place lastRow = {places.back().row, 0};
+  session.write(moving(places[drawnCursor], lastRow) + "\r\n" + std::string(text));
   forget();
 }
 
