@@ -124,14 +124,10 @@ class Editor {
     }
   }
 
-  void draw() {
-    const auto shown = wanted ? "(search)`" + wanted->text() + "': " : prompt;
-    display.draw(shown + line.text(), shown.size() + line.beforeCursor().size());
-  }
+  void draw() { display.draw(prompt + line.text(), prompt.size() + line.beforeCursor().size()); }
 
   void press(const std::string& key) {
     hadKilled = std::exchange(hasKilled, false);
-    if (followSearch(key)) return;
     if (isText(key)) return line.insert(key);
     for (const auto& [keys, act] : bindings()) {
       if (isOneOf(keys, key)) return act(*this);
@@ -236,36 +232,35 @@ class Editor {
     line.set(lines[place]);
   }
 
+  /// Ctrl-R. Any key that is not for the search ends it, and does what it does to what was found.
   void search() {
-    wanted.emplace();
-    placeBefore = place;
-  }
-
-  /// Whether `key` is for the search under way. Any other key ends it, and does what it does to
-  /// what was found.
-  bool followSearch(const std::string& key) {
-    if (!wanted) return false;
-    if (key == kCtrlR) {
-      find(place);
-    } else if (isOneOf(kBackspace, key)) {
-      wanted->erase(left);
-      show(placeBefore);
-      find(lines.size() - 1);
-    } else if (isText(key)) {
-      wanted->insert(key);
-      find(std::min(place + 1, lines.size() - 1));
-    } else {
-      wanted.reset();
-      if (key == kCtrlG) show(placeBefore);
-      return key == kCtrlG;
+    EditedLine wanted;
+    const auto promptBefore = prompt;
+    const auto placeBefore = place;
+    for (;;) {
+      prompt = "(search)`" + wanted.text() + "': ";
+      const auto key = readKey();
+      if (key == kCtrlR) {
+        find(wanted.text(), place);
+      } else if (isOneOf(kBackspace, key)) {
+        wanted.erase(left);
+        show(placeBefore);
+        find(wanted.text(), lines.size() - 1);
+      } else if (isText(key)) {
+        wanted.insert(key);
+        find(wanted.text(), std::min(place + 1, lines.size() - 1));
+      } else {
+        prompt = promptBefore;
+        if (key != kCtrlG) return press(key);
+        return show(placeBefore);
+      }
     }
-    return true;
   }
 
-  /// Goes to the newest line before `end` that holds what is wanted; stays where there is none.
-  void find(std::size_t end) {
-    while (!wanted->text().empty() && end-- > 0) {
-      const auto found = lines[end].find(wanted->text());
+  /// Goes to the newest line before `end` that holds `wanted`; stays where there is none.
+  void find(const std::string& wanted, std::size_t end) {
+    while (!wanted.empty() && end-- > 0) {
+      const auto found = lines[end].find(wanted);
       if (found == std::string::npos) continue;
       show(end);
       return line.set(line.text(), found);
@@ -310,15 +305,13 @@ class Editor {
   }
 
   Memory& memory;
-  const std::string& prompt;
+  std::string prompt;  // of the line, or of the search that is under way
   const platform::LineCompleter& complete;
   TerminalSession session;
   host::LineDisplay display{session};
   EditedLine line;
   std::vector<std::string> lines = memory.history;  // and the new one, as they have been edited
   std::size_t place = lines.size();                 // of the line in the editor
-  std::optional<EditedLine> wanted;                 // by the search that is under way
-  std::size_t placeBefore = 0;                      // that search
   bool hasKilled = false;                           // the last key
   bool hadKilled = false;                           // and the one before
   std::optional<bool> isLine;                       // how the editing has ended
