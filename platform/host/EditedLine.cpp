@@ -5,16 +5,6 @@
 #include "platform/host/ScreenText.h"
 
 namespace host {
-namespace {
-
-/// The length in bytes of the last character of `text`, which may be empty.
-std::size_t lastLength(std::string_view text) {
-  std::size_t length = 0;
-  for (; !text.empty(); text.remove_prefix(length)) length = firstLength(text);
-  return length;
-}
-
-}  // namespace
 
 void EditedLine::set(std::string text, std::size_t position) {
   bytes = std::move(text);
@@ -54,9 +44,9 @@ std::size_t EditedLine::after(Motion motion) const {
     case toEnd:
       return bytes.size();
     case left:
-      return cursor - lastLength(before);
+      return cursor - (before.empty() ? 0 : cellsOf(before).back().bytes);
     case right:
-      return cursor + (rest.empty() ? 0 : firstLength(rest));
+      return cursor + (rest.empty() ? 0 : cellsOf(rest).front().bytes);
     case wordLeft:
       return before.substr(0, before.find_last_not_of(kWhiteSpace) + 1).find_last_of(kWhiteSpace) +
              1;

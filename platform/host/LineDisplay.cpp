@@ -49,8 +49,9 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
   auto cells = cellsOf(text);
   auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
   // The cursor after a full row stands on a cell of its own.
-  if (placesOf(cells, columns).back().column >= columns) cells.push_back({" ", 1});
-  auto same = static_cast<std::size_t>(std::ranges::mismatch(drawn, cells).in1 - drawn.begin());
+  if (placesOf(cells, columns).back().column >= columns) cells.push_back({" ", 1, 0});
+  const auto changed = std::ranges::mismatch(drawn, cells, {}, &Cell::glyph, &Cell::glyph).in1;
+  auto same = static_cast<std::size_t>(changed - drawn.begin());
   if (const auto all = placesOf(cells, columns); all.back().row >= height) {
     const auto end = std::max(all[at].row + 1, height);
     const auto first = startOf(end - height, all);

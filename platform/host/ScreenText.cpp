@@ -26,9 +26,10 @@ Cell takeCell(std::string_view& text) {
   auto rest = text;
   while (!rest.empty() && columnsOf(posix::takeCodePoint(rest)) == 0) text = rest;
   const auto bytes = whole.substr(0, whole.size() - text.size());
-  if (columns <= 0) return {"\xEF\xBF\xBD", 1};
+  if (columns <= 0) return {"\xEF\xBF\xBD", 1, bytes.size()};
   std::string storage;
-  return {std::string(posix::asUtf8(bytes, storage)), static_cast<std::size_t>(columns)};
+  return {std::string(posix::asUtf8(bytes, storage)), static_cast<std::size_t>(columns),
+          bytes.size()};
 }
 
 }  // namespace
@@ -43,12 +44,6 @@ std::size_t columnsOf(const std::vector<Cell>& cells) {
   std::size_t columns = 0;
   for (const auto& cell : cells) columns += cell.columns;
   return columns;
-}
-
-std::size_t firstLength(std::string_view text) {
-  auto rest = text;
-  takeCell(rest);
-  return text.size() - rest.size();
 }
 
 }  // namespace host

@@ -12,14 +12,10 @@ namespace host {
 struct Cell {
   std::string glyph;
   std::size_t columns;  ///< 1 or 2
-
-  friend bool operator==(const Cell&, const Cell&) = default;
+  std::size_t bytes;    ///< of the text that it shows
 };
 
 std::vector<Cell> cellsOf(std::string_view text);
 std::size_t columnsOf(const std::vector<Cell>& cells);
-
-/// The length in bytes of the part of `text`, which must not be empty, that its first cell shows.
-std::size_t firstLength(std::string_view text);
 
 }  // namespace host
