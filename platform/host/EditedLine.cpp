@@ -34,7 +34,6 @@ void EditedLine::transpose() {
 }
 
 std::size_t EditedLine::after(Motion motion) const {
-  constexpr auto kWhiteSpace = " \t\n\v\f\r";
   const auto before = std::string_view(bytes).substr(0, cursor);
   const auto rest = std::string_view(bytes).substr(cursor);
   switch (motion) {
@@ -48,12 +47,9 @@ std::size_t EditedLine::after(Motion motion) const {
     case right:
       return cursor + (rest.empty() ? 0 : cellsOf(rest).front().bytes);
     case wordLeft:
-      return before.substr(0, before.find_last_not_of(kWhiteSpace) + 1).find_last_of(kWhiteSpace) +
-             1;
+      return before.substr(0, before.find_last_not_of(' ') + 1).rfind(' ') + 1;
     case wordRight:
-      return std::min(
-          bytes.find_first_of(kWhiteSpace, bytes.find_first_not_of(kWhiteSpace, cursor)),
-          bytes.size());
+      return std::min(bytes.find(' ', bytes.find_first_not_of(' ', cursor)), bytes.size());
   }
   return cursor;
 }

@@ -9,7 +9,8 @@ namespace host {
 /// A line that is being edited: its bytes, and a cursor before one of its characters or at its end.
 class EditedLine {
  public:
-  /// Where the cursor can go from where it is; white space separates words.
+  /// Where the cursor can go from where it is. Blanks separate words: no other white space gets
+  /// into a line.
   enum class Motion { toStart, toEnd, left, right, wordLeft, wordRight };
 
   const std::string& text() const { return bytes; }

@@ -27,7 +27,6 @@ constexpr int kRestOfSequence = 500;           // milliseconds for the next byte
 constexpr std::string_view kBackspace = "\x08 \x7F";
 constexpr std::string_view kCtrlG = "\a";
 constexpr std::string_view kCtrlR = "\x12";
-constexpr std::string_view kWhiteSpace = " \t\v\f\r\n";
 constexpr std::string_view kEndOfPaste = "\033[201~";
 
 /// Whether `key` is one of `keys`, which blanks separate.
@@ -169,7 +168,7 @@ class Editor {
     display.append("");
     isLine = true;
     auto& history = memory.history;
-    const bool isBlank = line.text().find_first_not_of(kWhiteSpace) == std::string::npos;
+    const bool isBlank = line.text().find_first_not_of(' ') == std::string::npos;
     if (isBlank || (!history.empty() && history.back() == line.text())) return;
     if (history.size() == kLongestHistory) history.erase(history.begin());
     history.push_back(line.text());
@@ -272,7 +271,7 @@ class Editor {
     const auto typed = line.beforeCursor();
     const auto candidates = complete(typed);
     if (candidates.empty()) return;
-    const auto start = typed.find_last_of(kWhiteSpace) + 1;
+    const auto start = typed.rfind(' ') + 1;
     auto word = commonStart(candidates);
     if (candidates.size() == 1 && !word.ends_with('/')) word += ' ';
     if (start + word.size() <= typed.size()) return list(candidates);
