@@ -18,7 +18,6 @@ namespace {
 
 constexpr std::string_view kMarkPastes = "\033[?2004h";
 constexpr std::string_view kMarkNoPastes = "\033[?2004l";
-constexpr int kOnce = static_cast<int>(SA_RESETHAND | SA_NODEFER);  // a signal is handled
 
 // A signal handler has no other way to what it needs.
 termios gBefore{};                          // settings to go back to
@@ -37,21 +36,15 @@ void leave() {
   std::ignore = ::write(STDOUT_FILENO, kMarkNoPastes.data(), kMarkNoPastes.size());
 }
 
-void handle(int signal, int flags, void (*handler)(int)) {
-  struct sigaction action = {};
-  action.sa_handler = handler;
-  action.sa_flags = flags;
-  sigaction(signal, &action, nullptr);
-}
-
 extern "C" void onWaking(int signal) { (signal == SIGCONT ? gWasContinued : gWasResized) = 1; }
 
-/// Called once for a signal, which then does what it does by default.
+/// Has a signal do what it does by default.
 extern "C" void onEnding(int signal) {
   const int errorBefore = errno;
   leave();
+  std::signal(signal, SIG_DFL);
   takeEffect(signal);
-  handle(signal, kOnce, onEnding);
+  std::signal(signal, onEnding);
   gWasContinued = 1;
   errno = errorBefore;
 }
@@ -114,15 +107,15 @@ TerminalSize sizeOfTerminal() {
 }
 
 TerminalSession::TerminalSession() {
-  for (const int signal : ending) handle(signal, kOnce, onEnding);
-  for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, onWaking);
+  for (const int signal : ending) std::signal(signal, onEnding);
+  for (const int signal : {SIGCONT, SIGWINCH}) std::signal(signal, onWaking);
   enter();
 }
 
 TerminalSession::~TerminalSession() {
   leave();
-  for (const int signal : ending) handle(signal, 0, SIG_DFL);
-  for (const int signal : {SIGCONT, SIGWINCH}) handle(signal, 0, SIG_DFL);
+  for (const int signal : ending) std::signal(signal, SIG_DFL);
+  for (const int signal : {SIGCONT, SIGWINCH}) std::signal(signal, SIG_DFL);
 }
 
 /// Takes the terminal. In the background that stops the process until it is in the foreground.
