@@ -3,6 +3,7 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <memory>
@@ -19,7 +20,6 @@
 
 namespace {
 
-using namespace std::chrono_literals;
 using std::chrono::steady_clock;
 
 constexpr int kWaking = SIGURG;  // has no effect but on the thread that awaits it
@@ -79,15 +79,12 @@ class WorkLine {
 
  private:
   void run(const std::stop_token& over) const {
-    for (auto next = begin + 1s;;) {
-      const std::chrono::nanoseconds left = std::max(next - steady_clock::now(), {});
-      const timespec limit = {left / 1s, left % 1s / 1ns};
-      const int signal = sigtimedwait(&awaited, nullptr, &limit);
+    constexpr timespec kSecond = {1, 0};
+    for (;;) {
+      const int signal = sigtimedwait(&awaited, nullptr, &kSecond);
       if (signal == kWaking && over.stop_requested()) return;
       if (signal > 0) take(signal);
-      if (steady_clock::now() < next) continue;
-      draw();
-      next += 1s;
+      if (signal < 0 && errno == EAGAIN) draw();
     }
   }
 
