@@ -45,12 +45,6 @@ void clear() {
   if (host::hasTerminal(STDOUT_FILENO)) print(wasLineTyped() ? "\033[A\r \033[J\r" : "\r\033[K");
 }
 
-void stopShowing() {
-  const std::lock_guard lock(gMutex);
-  gMayShow = false;
-  clear();
-}
-
 /// "1:05", or "1:05, 1200 lines" once there are lines.
 std::string describe(std::chrono::seconds time, std::size_t lines) {
   const auto seconds = std::to_string(time.count() % 60);
@@ -72,7 +66,7 @@ class WorkLine {
   WorkLine(const WorkLine&) = delete;
   WorkLine& operator=(const WorkLine&) = delete;
   ~WorkLine() {
-    stopShowing();
+    posix::beforeOutput();
     thread.request_stop();
     pthread_kill(thread.native_handle(), kWaking);
   }
@@ -119,7 +113,11 @@ class WorkLine {
 
 }  // namespace
 
-void posix::beforeOutput() { stopShowing(); }
+void posix::beforeOutput() {
+  const std::lock_guard lock(gMutex);
+  gMayShow = false;
+  clear();
+}
 
 std::shared_ptr<void> platform::showWork() {
   if (!host::canMoveCursor(STDOUT_FILENO) || !host::canMoveCursor(STDERR_FILENO)) return nullptr;
