@@ -55,8 +55,6 @@ class TerminalSession {
   /// Waits until the process has the terminal, as a read would, and sets it to give each key as it
   /// is typed, and a paste between marks.
   TerminalSession();
-  TerminalSession(const TerminalSession&) = delete;
-  TerminalSession& operator=(const TerminalSession&) = delete;
 
   /// Puts the settings back.
   ~TerminalSession();

@@ -63,8 +63,6 @@ class WorkLine {
     gMayShow = true;
     thread = std::jthread([this](const std::stop_token& over) { run(over); });
   }
-  WorkLine(const WorkLine&) = delete;
-  WorkLine& operator=(const WorkLine&) = delete;
   ~WorkLine() {
     posix::beforeOutput();
     thread.request_stop();
