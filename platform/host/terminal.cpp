@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <map>
-#include <span>
 #include <string_view>
 #include <utility>
 #include <vector>
@@ -88,11 +87,6 @@ class Editor {
   }
 
  private:
-  struct Binding {
-    std::string_view keys;  // as terminals send them, separated by blanks
-    void (*act)(Editor&);
-  };
-
   /// Reads all that one key sends; nothing at the end of the input.
   std::string readKey() {
     std::string key;
@@ -125,17 +119,9 @@ class Editor {
 
   void draw() { display.draw(prompt + line.text(), prompt.size() + line.beforeCursor().size()); }
 
-  void press(const std::string& key) {
-    hadKilled = std::exchange(hasKilled, false);
-    if (isText(key)) return line.insert(key);
-    for (const auto& [keys, act] : bindings()) {
-      if (isOneOf(keys, key)) return act(*this);
-    }
-  }
-
-  /// What each key does that is no text.
-  static std::span<const Binding> bindings() {
-    static constexpr Binding kBindings[] = {
+  /// The keys that are no text, as terminals send them, separated by blanks; and what they do.
+  static const auto& bindings() {
+    static constexpr std::pair<std::string_view, void (*)(Editor&)> kBindings[] = {
         {"\x01 \033[H \033[1~ \033[7~", [](Editor& e) { e.line.move(toStart); }},
         {"\x05 \033[F \033[4~ \033[8~", [](Editor& e) { e.line.move(toEnd); }},
         {"\x02 \033[D \033[1;2D", [](Editor& e) { e.line.move(left); }},
@@ -161,6 +147,14 @@ class Editor {
         {"\033[200~", [](Editor& e) { e.paste(); }},
     };
     return kBindings;
+  }
+
+  void press(const std::string& key) {
+    hadKilled = std::exchange(hasKilled, false);
+    if (isText(key)) return line.insert(key);
+    for (const auto& [keys, act] : bindings()) {
+      if (isOneOf(keys, key)) return act(*this);
+    }
   }
 
   void accept() {
@@ -323,7 +317,6 @@ std::optional<bool> platform::readEditedLine(const std::string& prompt,
   static const bool isEditing =
       host::canMoveCursor(STDIN_FILENO) && host::canMoveCursor(STDOUT_FILENO);
   if (!isEditing) return std::nullopt;
-  static auto& memory =
-      *new Memory;  // never destroyed, as nothing is that exit(3) would take from a thread
+  static auto& memory = *new Memory;  // never destroyed: other threads outlive exit
   return Editor(memory, prompt, complete).read(line);
 }
