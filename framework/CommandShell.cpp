@@ -16,16 +16,10 @@ bool CommandShell::run(std::list<std::string> words) {
   if (!words.empty()) words.pop_back();
   if (!words.empty()) return runBatch(words) != Outcome::failed;
   promptCommand = rootCommand;
-  return runLines() != Outcome::failed;
-}
-
-/// Prompts and runs lines until one of them quits or, which is a failure, none can be read.
-CommandShell::Outcome CommandShell::runLines() {
-  for (;;) {
-    std::string line;
-    if (!readLine(line)) return Outcome::failed;
-    if (runBatch(convertLineToList(line)) == Outcome::quit) return Outcome::quit;
+  for (std::string line; readLine(line);) {
+    if (runBatch(convertLineToList(line)) == Outcome::quit) return true;
   }
+  return false;
 }
 
 /// Prompts and reads a line. False if there is none.

@@ -19,20 +19,18 @@ class CommandShell {
   /// `CommandBase::complete` of the node at which the prompt stands.
   using Completer = std::function<CommandBase::Candidates(const std::string& typed)>;
 
-  /// Shows `prompt`, lets the user edit a line and stores it in `line`, which was empty, without a
-  /// line end. Returns true for a line and false at the end of the input; no value, and shows and
-  /// reads nothing, if lines cannot be edited here.
+  /// Shows `prompt`, lets the user edit a line and stores it in `line` without a line end. Returns
+  /// true for a line and false at the end of the input; no value, and shows and reads nothing, if
+  /// lines cannot be edited here.
   using LineReader = std::function<std::optional<bool>(
       const std::string& prompt, const Completer& complete, std::string& line)>;
-
-  CommandShell() = default;
 
   /// Shows that a handler runs until what it returns is released.
   using WorkShower = std::function<std::shared_ptr<void>()>;
 
   /// Reads lines with `readEdited`, or from std::cin if that is empty or returns no value. Calls
   /// `showWork`, unless it is empty, before each run of a handler.
-  explicit CommandShell(LineReader readEdited, WorkShower showWork = {})
+  explicit CommandShell(LineReader readEdited = {}, WorkShower showWork = {})
       : readEdited(std::move(readEdited)), showWork(std::move(showWork)) {}
 
   CommandShell(const CommandShell&) = delete;
@@ -57,7 +55,6 @@ class CommandShell {
   /// The end of a command group or of a batch of them.
   enum class Outcome { succeeded, failed, quit };
 
-  Outcome runLines();
   bool readLine(std::string& line) const;
   Outcome runBatch(const std::list<std::string>& words);
   Outcome runGroup(std::list<std::string> words);

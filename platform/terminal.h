@@ -15,9 +15,9 @@ namespace platform {
 using LineCompleter = std::function<std::map<std::string, std::string>(const std::string& typed)>;
 
 /// Shows `prompt` on the terminal and has a person edit a line there, with keys to move about, a
-/// history of the lines before, and `complete` for Tab. Leaves the line in the empty `line`,
-/// without its line end, each byte as it was typed. A paste gives a line for each key that ends
-/// one, and has a blank for all other white space.
+/// history of the lines before, and `complete` for Tab. Stores the line in `line`, without its line
+/// end, each byte as it was typed. A paste gives a line for each key that ends one, and has a blank
+/// for all other white space.
 ///
 /// True for a line; an empty one when Ctrl-C has given it up. False when the input has ended.
 /// Nothing, with nothing shown or read, when there is no terminal to edit on: standard input or
