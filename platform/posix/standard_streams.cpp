@@ -24,12 +24,10 @@ class DescriptorBuffer final : public std::streambuf {
     return gptr() == egptr() ? traits_type::eof() : traits_type::to_int_type(*gptr());
   }
 
+  /// Called by the public functions of the base alone, which have a byte that does not fit.
   int_type overflow(int_type byte) override {
     sync();
-    if (!traits_type::eq_int_type(byte, traits_type::eof())) {
-      sputc(traits_type::to_char_type(byte));
-    }
-    return traits_type::not_eof(byte);
+    return sputc(traits_type::to_char_type(byte));
   }
 
   int sync() override {
