@@ -15,10 +15,11 @@ struct Escape {
 
 bool isOctal(char letter) { return letter >= '0' && letter <= '7'; }
 
-/// The escape sequence at the start of `text`, or the backslash itself.
+/// The escape sequence at the start of `text`, or its first byte as it is.
 Escape firstEscape(std::string_view text) {
   constexpr std::string_view kLetters = "abfnrtv\\\"'";
   constexpr std::string_view kMeanings = "\a\b\f\n\r\t\v\\\"'";
+  if (text[0] != '\\') return {text[0], 1};
   if (text.size() >= 2 && kLetters.find(text[1]) != std::string_view::npos) {
     return {kMeanings[kLetters.find(text[1])], 2};
   }
@@ -40,17 +41,14 @@ std::string_view processName(std::string_view comm, std::string_view exePath) {
 }
 
 std::string_view unescaped(std::string_view escaped, std::string& storage) {
-  std::size_t backslash = escaped.find('\\');
-  if (backslash == std::string_view::npos) return escaped;
+  if (escaped.find('\\') == std::string_view::npos) return escaped;
   storage.clear();
-  for (; backslash != std::string_view::npos; backslash = escaped.find('\\')) {
-    storage.append(escaped.substr(0, backslash));
-    escaped.remove_prefix(backslash);
+  while (!escaped.empty()) {
     const Escape escape = firstEscape(escaped);
     storage += escape.byte;
     escaped.remove_prefix(escape.length);
   }
-  return storage.append(escaped);
+  return storage;
 }
 
 }  // namespace host
