@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <limits>
 #include <string_view>
+#include <utility>
 
 #include "platform/telephony.h"
 
@@ -12,11 +13,9 @@ namespace {
 
 /// The mode that a word stands for.
 std::optional<std::int32_t> ModeOfWord(const std::string& value) {
-  static constexpr struct {
-    const char* word;
-    std::int32_t mode;
-  } kModes[] = {{"false", 0}, {"off", 0}, {"no", 0},   {"true", 1},
-                {"on", 1},    {"yes", 1}, {"full", 1}, {"lite", 2}};
+  static constexpr std::pair<std::string_view, std::int32_t> kModes[] = {
+      {"false", 0}, {"off", 0}, {"no", 0},   {"true", 1},
+      {"on", 1},    {"yes", 1}, {"full", 1}, {"lite", 2}};
   for (const auto& [word, mode] : kModes) {
     if (util::equal_nocase(value, word)) return mode;
   }
