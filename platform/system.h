@@ -35,9 +35,6 @@ class FileHandle {
   /// file that the device reads; neither is changed. Never waits.
   static std::unique_ptr<FileHandle> createEmpty(const std::string& path);
 
-  FileHandle() = default;
-  FileHandle(const FileHandle&) = delete;
-  FileHandle& operator=(const FileHandle&) = delete;
   virtual ~FileHandle() = default;
 
   /// Appends all of `bytes`, unbuffered, with one system call where the system takes them whole.
