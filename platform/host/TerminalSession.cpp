@@ -153,14 +153,15 @@ TerminalSession::Event TerminalSession::wait(int milliseconds) {
   }
 }
 
-std::optional<char> TerminalSession::read() {
+bool TerminalSession::read(std::string& bytes) {
   constexpr char kCtrlD = 4;
   const posix::SignalMask now(blocked.before());
   char byte = 0;
-  if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return std::nullopt;
+  if (posix::readSome(STDIN_FILENO, &byte, 1) != 1) return false;
   const bool isAhead = typedAhead > 0;
   if (isAhead) --typedAhead;
-  return isAhead && byte == '\0' ? kCtrlD : byte;
+  bytes += isAhead && byte == '\0' ? kCtrlD : byte;
+  return true;
 }
 
 void TerminalSession::write(std::string_view text) {

@@ -2,7 +2,7 @@
 
 #include <csignal>
 #include <cstddef>
-#include <optional>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -63,10 +63,10 @@ class TerminalSession {
   /// it returns.
   Event wait(int milliseconds);
 
-  /// The next byte, and no more: what follows the line may be for another program. None at the end
-  /// of the input. Ctrl-D that was typed before the session is one all the same: the system keeps
-  /// it as a NUL.
-  std::optional<char> read();
+  /// Appends the next byte to `bytes`, and no more: what follows the line may be for another
+  /// program. False at the end of the input. Ctrl-D that was typed before the session is one all
+  /// the same: the system keeps it as a NUL.
+  bool read(std::string& bytes);
 
   void write(std::string_view text);
 

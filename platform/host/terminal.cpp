@@ -110,10 +110,7 @@ class Editor {
       if (event == Event::timeout) return false;
       if (event == Event::resized) display.clear();
       if (event == Event::continued) display.forget();
-      if (event != Event::input) continue;
-      const auto byte = session.read();
-      if (byte) key += *byte;
-      return byte.has_value();
+      if (event == Event::input) return session.read(key);
     }
   }
 
