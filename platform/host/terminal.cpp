@@ -167,8 +167,7 @@ class Editor {
 
   /// Ctrl-C. The lines of a paste that are still to come go as well.
   void giveUp() {
-    line.move(toEnd);
-    line.insert("^C");
+    line.set(line.text() + "^C");
     draw();
     display.append("");
     line.set("");
@@ -275,8 +274,7 @@ class Editor {
     std::vector<std::vector<host::Cell>> labels;
     std::size_t widest = 0;
     for (const auto& [word, note] : candidates) {
-      const auto slash = word.rfind('/', word.size() - 2);  // of a path, its last element
-      const auto name = word.substr(slash == std::string::npos ? 0 : slash + 1);
+      const auto name = word.substr(word.rfind('/', word.size() - 2) + 1);  // a path's last element
       labels.push_back(host::cellsOf(note.empty() ? name : name + " (" + note + ')'));
       widest = std::max(widest, host::columnsOf(labels.back()) + 2);
     }
