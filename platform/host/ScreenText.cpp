@@ -40,10 +40,4 @@ std::vector<Cell> cellsOf(std::string_view text) {
   return cells;
 }
 
-std::size_t columnsOf(const std::vector<Cell>& cells) {
-  std::size_t columns = 0;
-  for (const auto& cell : cells) columns += cell.columns;
-  return columns;
-}
-
 }  // namespace host

@@ -16,6 +16,5 @@ struct Cell {
 };
 
 std::vector<Cell> cellsOf(std::string_view text);
-std::size_t columnsOf(const std::vector<Cell>& cells);
 
 }  // namespace host

@@ -47,6 +47,12 @@ bool isWhole(std::string_view key) {
   return key.size() > 2 && (last < 0x20 || last >= 0x40);  // ECMA-48, 5.4
 }
 
+std::size_t columnsOf(const std::vector<host::Cell>& cells) {
+  std::size_t columns = 0;
+  for (const auto& cell : cells) columns += cell.columns;
+  return columns;
+}
+
 /// What `candidates` have in common at their start, in whole characters.
 std::string commonStart(const Candidates& candidates) {
   const auto& first = candidates.begin()->first;
@@ -276,7 +282,7 @@ class Editor {
     for (const auto& [word, note] : candidates) {
       const auto name = word.substr(word.rfind('/', word.size() - 2) + 1);  // a path's last element
       labels.push_back(host::cellsOf(note.empty() ? name : name + " (" + note + ')'));
-      widest = std::max(widest, host::columnsOf(labels.back()) + 2);
+      widest = std::max(widest, columnsOf(labels.back()) + 2);
     }
     const auto [height, width] = host::sizeOfTerminal();
     const auto columns = std::max<std::size_t>(1, width / widest);
@@ -285,7 +291,7 @@ class Editor {
     for (std::size_t i = 0; i < shown; ++i) {
       const bool isLast = (i + 1) % columns == 0 || i + 1 == shown;
       for (const auto& cell : labels[i]) text += cell.glyph;
-      text += isLast ? "\r\n" : std::string(widest - host::columnsOf(labels[i]), ' ');
+      text += isLast ? "\r\n" : std::string(widest - columnsOf(labels[i]), ' ');
     }
     if (shown < labels.size()) text += "... " + std::to_string(labels.size() - shown) + " more\r\n";
     draw();
