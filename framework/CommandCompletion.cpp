@@ -21,20 +21,16 @@ struct Usage {
   Words options;  ///< those with a dash take arguments
 };
 
-/// The end of a piece of a help text that starts with `opening`.
-char Closing(char opening) {
-  if (opening == '[') return ']';
-  return opening == '<' ? '>' : ' ';
-}
-
 /// Reads the brackets, angles and dashes in front of the description.
 Usage ReadUsage(const std::string& help) {
+  constexpr std::string_view kOpening = "[<-";
+  constexpr std::string_view kClosing = "]> ";
   Usage usage;
   std::istringstream rest(help);
   char kind = 0;
-  while (rest >> kind && (kind == '[' || kind == '<' || kind == '-')) {
+  while (rest >> kind && kOpening.find(kind) != std::string_view::npos) {
     std::string text;
-    std::getline(rest, text, Closing(kind));
+    std::getline(rest, text, kClosing[kOpening.find(kind)]);
     if (kind == '-') {
       usage.options.push_back('-' + text);
     } else if (kind == '[' && text.find(' ') != std::string::npos) {
