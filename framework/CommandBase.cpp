@@ -14,7 +14,7 @@ void CommandBase::addCommandHandler(const std::string& name, CommandHandler hand
   if (!handler) return;
   commandHandlers[name] = std::move(handler);
   if (!helpText.empty()) commandHelp[name] = helpText;
-  if (!note.empty()) commandNotes[name] = note;
+  commandNotes[name] = note;
 }
 
 void CommandBase::addSubCommand(const std::string& name, std::shared_ptr<CommandBase> child) {

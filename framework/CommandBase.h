@@ -42,8 +42,8 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   virtual bool isAllowed(std::string name);
 
   /// Registers `handler` under `name`; it replaces an earlier one. A list of completions shows
-  /// `note` beside the name. An empty handler is ignored together with its texts. An empty text
-  /// leaves an earlier one in place.
+  /// `note` beside the name. An empty handler is ignored together with its texts. An empty help
+  /// text leaves an earlier one in place.
   void addCommandHandler(const std::string& name, CommandHandler handler,
                          const std::string& helpText, const std::string& note = "");
 
@@ -108,5 +108,5 @@ class CommandBase : public std::enable_shared_from_this<CommandBase> {
   std::map<std::string, CommandHandler> commandHandlers;
   std::map<std::string, std::string> commandHelp;  // only for handlers that have a help text
   std::map<std::string, std::shared_ptr<CommandBase>> subCommands;
-  std::map<std::string, std::string> commandNotes;  // only for handlers that have a note
+  Candidates commandNotes;  // of all handlers
 };

@@ -117,7 +117,6 @@ CommandBase::Candidates CommandBase::complete(const std::string& typed) {
 
 CommandBase::Candidates CommandBase::completeName(const std::string& start, bool isFirst) const {
   Candidates names = commandNotes;
-  for (const auto& [handler, callable] : commandHandlers) names[handler];
   for (const auto& [word, child] : subCommands) names[word];
   for (const auto* const word : {"cd", "help"}) names[word];
   if (isFirst) {
