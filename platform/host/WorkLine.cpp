@@ -86,11 +86,9 @@ class WorkLine {
     if (!host::takesOutput(STDOUT_FILENO)) return;
     if (wasLineTyped()) return clear();
     const auto time = std::chrono::floor<std::chrono::seconds>(steady_clock::now() - begin);
-    std::string text = "\rrunning ";
-    text += describe(time, posix::linesWritten() - linesBefore);
+    auto text = "\rrunning " + describe(time, posix::linesWritten() - linesBefore);
     text.resize(std::min(text.size(), host::sizeOfTerminal().columns));
-    text += "\033[K";
-    print(text);
+    print(text + "\033[K");
     gIsShown = true;
   }
 
