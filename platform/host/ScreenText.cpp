@@ -12,7 +12,6 @@ namespace {
 int columnsOf(char32_t codePoint) {
   static const locale_t utf8 = newlocale(LC_CTYPE_MASK, "C.UTF-8", nullptr);
   if (codePoint == U'\0') return -1;
-  if (codePoint >= U' ' && codePoint <= U'~') return 1;
   const locale_t before = uselocale(utf8);  // a null one changes nothing
   const int columns = wcwidth(static_cast<wchar_t>(codePoint));
   uselocale(before);
