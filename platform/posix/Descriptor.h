@@ -15,10 +15,6 @@ class Descriptor {
  public:
   explicit Descriptor(int opened = -1) noexcept : number(opened) {}
   Descriptor(Descriptor&& other) noexcept : number(std::exchange(other.number, -1)) {}
-  Descriptor& operator=(Descriptor&& other) noexcept {
-    std::swap(number, other.number);
-    return *this;
-  }
   ~Descriptor() {
     if (number >= 0) ::close(number);
   }
