@@ -74,12 +74,6 @@ struct queue::Worker {
       lock.lock();
     }
   }
-
-  void abandon() {
-    const std::lock_guard lock(mutex);
-    abandoned = true;
-    changed.notify_one();
-  }
 };
 
 queue::queue(std::string label) {
@@ -91,7 +85,11 @@ queue::queue(std::string label) {
   pthread_setname_np(thread.native_handle(), label.c_str());
   thread.detach();
   // Counts the references to the queue apart from that of the thread.
-  worker = std::shared_ptr<Worker>(shared.get(), [shared](Worker* left) { left->abandon(); });
+  worker = std::shared_ptr<Worker>(shared.get(), [shared](Worker* left) {
+    const std::lock_guard lock(left->mutex);
+    left->abandoned = true;
+    left->changed.notify_one();
+  });
 }
 
 void queue::async(block<void()> task) const {
