@@ -40,11 +40,10 @@ bool isText(const std::string& key) {
 /// Whether `key`, which starts with an escape, is all that the key sends.
 bool isWhole(std::string_view key) {
   if (key.size() < 2) return false;
-  const auto last = static_cast<unsigned char>(key.back());
   if (key[1] != '[' && key[1] != 'O') return key.size() > posix::utf8Length(key[1]);
-  if (key.starts_with("\033[M")) return key.size() == 6;   // a mouse, and where it is
-  if (key.starts_with("\033[[")) return key.size() == 4;   // a function key of Linux's console
-  return key.size() > 2 && (last < 0x20 || last >= 0x40);  // ECMA-48, 5.4
+  if (key.starts_with("\033[M")) return key.size() == 6;  // a mouse, and where it is
+  if (key.starts_with("\033[[")) return key.size() == 4;  // a function key of Linux's console
+  return key.size() > 2 && (key.back() < 0x20 || key.back() >= 0x40);  // ECMA-48, 5.4
 }
 
 std::size_t columnsOf(const std::vector<host::Cell>& cells) {
