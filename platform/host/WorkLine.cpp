@@ -11,7 +11,6 @@
 #include <stop_token>
 #include <string>
 #include <thread>
-#include <tuple>
 
 #include "platform/host/TerminalSession.h"
 #include "platform/posix/Descriptor.h"
@@ -29,7 +28,7 @@ std::mutex gMutex;
 bool gMayShow = false;
 bool gIsShown = false;
 
-void print(const std::string& text) { std::ignore = posix::writeAll(STDOUT_FILENO, text); }
+void print(const std::string& text) { static_cast<void>(posix::writeAll(STDOUT_FILENO, text)); }
 
 /// Whether a line has been typed, which the terminal then shows.
 bool wasLineTyped() {
