@@ -50,20 +50,19 @@ void LineDisplay::draw(std::string_view text, std::size_t cursor) {
   auto at = std::min(cellsOf(text.substr(0, cursor)).size(), cells.size());
   // The cursor after a full row stands on a cell of its own.
   if (placesOf(cells, columns).back().column >= columns) cells.push_back({" ", 1, 0});
-  const auto changed = std::ranges::mismatch(drawn, cells, {}, &Cell::glyph, &Cell::glyph).in1;
-  auto same = static_cast<std::size_t>(changed - drawn.begin());
   if (const auto all = placesOf(cells, columns); all.back().row >= height) {
     const auto end = std::max(all[at].row + 1, height);
     const auto first = startOf(end - height, all);
     if (end <= all.back().row) cells.erase(cells.begin() + startOf(end, all), cells.end());
     cells.erase(cells.begin(), cells.begin() + first);
     at -= static_cast<std::size_t>(first);
-    same = 0;
   }
 
   const auto before = placesOf(drawn, columns);
   const auto now = placesOf(cells, columns);
-  const Place start = before[same];
+  const auto changed = std::ranges::mismatch(drawn, cells, {}, &Cell::glyph, &Cell::glyph).in1;
+  const auto same = static_cast<std::size_t>(changed - drawn.begin());
+  const Place start = std::ranges::min(before[same], now[same], {}, &Place::row);
   std::string output = drawn.empty() ? "\r" : moving(before[drawnCursor], start);
   if (drawn.empty() || same < drawn.size()) {
     // tmux takes a row that is cleared from its first column on for a line of its own, and keeps
