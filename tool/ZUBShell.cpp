@@ -24,23 +24,18 @@ void FollowServerState(const std::shared_ptr<zub::client::Manager>& manager,
   zub::client::EventsOn(manager);
 }
 
-/// Connects to the server and builds the tree on that connection.
-std::shared_ptr<CommandBase> Connect() {
-  const dispatch::queue queue("zubtool.queue");
-  const auto manager = zub::client::CreateManager("zubtool", queue);
-  const auto group = dispatch::group::create();
-  FollowServerState(manager, group);
-  // If the library keeps the handler, the group stays open and the wait takes its full time. The
-  // result does not matter: commands that need the server check its state.
-  static_cast<void>(group.wait(kFirstStateWait));
-  return ZUBCommand::create(getprogname(), {}, manager, queue);
-}
-
 }  // namespace
 
 std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
   try {
-    return Connect();
+    const dispatch::queue queue("zubtool.queue");
+    const auto manager = zub::client::CreateManager("zubtool", queue);
+    const auto group = dispatch::group::create();
+    FollowServerState(manager, group);
+    // If the library keeps the handler, the group stays open and the wait takes its full time. The
+    // result does not matter: commands that need the server check its state.
+    static_cast<void>(group.wait(kFirstStateWait));
+    return ZUBCommand::create(getprogname(), {}, manager, queue);
   } catch (const std::system_error& failure) {
     std::cerr << "Cannot connect to the server: " << failure.what() << std::endl;
     return nullptr;
