@@ -1,8 +1,7 @@
 #include "framework/CommandBase.h"
 
 void CommandBase::init() {
-  const auto above = parent.lock();
-  if (above) hierarchy = above->hierarchy;
+  if (const auto above = parent.lock()) hierarchy = above->hierarchy;
   hierarchy += "/" + name;
   registerCommands();
 }
