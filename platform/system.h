@@ -31,8 +31,8 @@ void openStandardStreams();
 class FileHandle {
  public:
   /// Creates the file at `path`, with access for its owner alone, or truncates it. Opens a device
-  /// or a pipe without changing it. Returns null on failure, and for a pipe that nobody reads and a
-  /// file that the device reads; neither is changed. Never waits.
+  /// or a pipe without changing it. Returns null on failure, and for a pipe that nobody reads, a
+  /// file of a standard stream and one that the device reads; none is changed. Never waits.
   static std::unique_ptr<FileHandle> createEmpty(const std::string& path);
 
   virtual ~FileHandle() = default;

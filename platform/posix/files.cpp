@@ -1,6 +1,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <array>
 #include <atomic>
 
 #include "platform/posix/Descriptor.h"
@@ -24,12 +26,22 @@ class AppendedFile final : public FileHandle {
   posix::Descriptor descriptor;
 };
 
+/// Whether it is the file of a standard stream: commands are read there, or results are written.
+bool isOfStandardStream(const struct stat& file) {
+  constexpr std::array kStreams = {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO};
+  return std::ranges::any_of(kStreams, [&file](int stream) {
+    struct stat other = {};
+    return fstat(stream, &other) == 0 && other.st_dev == file.st_dev && other.st_ino == file.st_ino;
+  });
+}
+
 /// Truncates the file, unless it is a device or a pipe. Uses the descriptor that is then written:
 /// by now the path may lead to another file.
 bool empty(const posix::Descriptor& opened) {
   struct stat about = {};
   if (fstat(opened.get(), &about) != 0) return false;
-  return !S_ISREG(about.st_mode) || ftruncate(opened.get(), 0) == 0;
+  if (!S_ISREG(about.st_mode)) return true;
+  return !isOfStandardStream(about) && ftruncate(opened.get(), 0) == 0;
 }
 
 }  // namespace

@@ -36,6 +36,13 @@ TEST(Files, AreEmptiedThenAppendedToAndOfOtherKindsLeftAsTheyAre) {
   EXPECT_EQ(platform::FileHandle::createEmpty(folder.path("")), nullptr) << "a folder";
   const auto full = platform::FileHandle::createEmpty("/dev/full");
   EXPECT_TRUE(!full || full->write("bytes") == std::errc::no_space_on_device);
+  for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+    const int before = dup(stream);
+    dup2(open(path.c_str(), O_RDONLY | O_CLOEXEC), stream);
+    EXPECT_EQ(platform::FileHandle::createEmpty(path), nullptr) << stream;
+    dup2(before, stream);
+  }
+  EXPECT_NE(readFile(path), "");
 }
 
 TEST(StandardStreams, AreOpenIfTheyWereClosed) {
