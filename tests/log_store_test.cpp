@@ -257,6 +257,9 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   host::device().logEnd = 9;
   EXPECT_EQ(run(stream(log)).reason, 9);
   EXPECT_EQ(run(stream(write("cut", kDate))).reason, kDamaged);
+  const auto truncated = stream(write("shorter", kDate + "\n" + kDate + "\n"));
+  std::filesystem::resize_file(folder + "/shorter", kDate.size() + 1);
+  EXPECT_EQ(run(truncated).reason, kUnreadable);
   host::device().logEnd = std::nullopt;
   delivered = run(stream(log), 4);  // stays open after the last event
   EXPECT_EQ(delivered.events.size(), 4);

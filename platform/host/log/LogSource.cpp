@@ -46,6 +46,9 @@ class RecordedSource final : public LogSource {
     while (stop.waitReadable(descriptor.get())) {
       ssize_t count = ::pread(descriptor.get(), buffer, size, offset);
       if (count < 0 && errno == ESPIPE) count = ::read(descriptor.get(), buffer, size);
+      if (count == 0 && end() < endAtFirst) {
+        throw std::runtime_error(path + ": truncated while it was read");
+      }
       if (count >= 0) return static_cast<std::size_t>(count);
       if (errno != EINTR && errno != EAGAIN) {
         throw std::system_error(errno, std::generic_category(), path);
@@ -54,8 +57,12 @@ class RecordedSource final : public LogSource {
     return std::nullopt;
   }
 
+  /// The size of a file; -1 for what has none.
+  off_t end() const { return ::lseek(descriptor.get(), 0, SEEK_END); }
+
   std::string path;
   posix::Descriptor descriptor;
+  const off_t endAtFirst = end();
 };
 
 /// The files of a journal, as it was when it was prepared.
