@@ -74,6 +74,6 @@ for ((kib = 4096; kib < 65536; kib += 16)); do
     fail "with $kib KiB: status $status: $why"
 done
 for refusal in 'Cannot start: not enough memory' \
-  'Cannot '{'start the shell thread','connect to the server'}': Resource temporarily unavailable'; do
+  'Cannot '{'start the shell thread','connect to the server: no thread'}': Resource temporarily unavailable'; do
   grep -qx "$refusal" errors || fail "never: $refusal"
 done

@@ -8,9 +8,8 @@
 #include <deque>
 #include <mutex>
 #include <new>
-#include <thread>
 
-#include "platform/posix/SignalMask.h"
+#include "platform/posix/Thread.h"
 
 namespace dispatch {
 
@@ -78,8 +77,7 @@ struct queue::Worker {
 
 queue::queue(std::string label) {
   const auto shared = std::make_shared<Worker>();
-  const posix::SignalMask onTheThread;
-  std::thread thread([shared] { shared->run(); });
+  std::thread thread = posix::startThread([shared] { shared->run(); });
   constexpr std::size_t kLongestThreadName = 15;  // pthread_setname_np(3)
   label.resize(std::min(label.size(), kLongestThreadName));
   pthread_setname_np(thread.native_handle(), label.c_str());

@@ -12,7 +12,7 @@
 #include "platform/host/device/Device.h"
 #include "platform/host/device/Requests.h"
 #include "platform/posix/Descriptor.h"
-#include "platform/posix/SignalMask.h"
+#include "platform/posix/Thread.h"
 
 namespace zub {
 
@@ -111,8 +111,7 @@ void startServer(const std::shared_ptr<Manager>& manager) {
   for (; next != steps.end() && next->at.count() == 0; ++next) manager->enterState(next->state);
   steps.erase(steps.begin(), next);
   if (steps.empty()) return;
-  const posix::SignalMask onTheThread;
-  std::thread([manager, start, steps = std::move(steps)]() mutable {
+  posix::startThread([manager, start, steps = std::move(steps)]() mutable {
     for (auto& step : steps) {
       std::this_thread::sleep_until(start + step.at);
       manager->enterState(std::move(step.state));

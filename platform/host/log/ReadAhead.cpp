@@ -2,6 +2,8 @@
 
 #include <utility>
 
+#include "platform/posix/Thread.h"
+
 namespace host {
 namespace {
 
@@ -11,7 +13,8 @@ constexpr std::size_t kBatchBytes = std::size_t{256} << 10;
 
 ReadAhead::ReadAhead(StopSignal& stop, Open open, Wanted wanted)
     : stopSignal(stop),
-      thread([this, open = std::move(open), wanted = std::move(wanted)] { run(open, wanted); }) {}
+      thread(posix::startThread(
+          [this, open = std::move(open), wanted = std::move(wanted)] { run(open, wanted); })) {}
 
 ReadAhead::~ReadAhead() {
   stopSignal.raise();

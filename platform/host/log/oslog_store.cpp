@@ -3,7 +3,6 @@
 #include <new>
 #include <stdexcept>
 #include <string>
-#include <thread>
 #include <utility>
 
 #include "platform/host/device/Device.h"
@@ -13,7 +12,7 @@
 #include "platform/host/log/ReadAhead.h"
 #include "platform/host/log/StopSignal.h"
 #include "platform/host/log/StreamEnd.h"
-#include "platform/posix/SignalMask.h"
+#include "platform/posix/Thread.h"
 #include "platform/system.h"
 
 namespace {
@@ -106,9 +105,8 @@ class HostStream final : public OSLogEventStream {
     // Shared, so that it is still there when no thread can be had.
     const auto handed = std::make_shared<Delivery>();
     std::swap(*handed, delivery);
-    const posix::SignalMask onTheThread;
     try {
-      std::thread([handed] { run(std::move(*handed)); }).detach();
+      posix::startThread([handed] { run(std::move(*handed)); }).detach();
     } catch (const std::exception& failure) {
       report(failure.what());
       end(std::move(*handed), host::kStreamUnreadable);
