@@ -352,7 +352,12 @@ TEST_F(LogStore, SaysWhyItCannotBePrepared) {
   EXPECT_EQ(prepareError(folder + "/none"), folder + "/none: No such file or directory");
   EXPECT_EQ(prepareError(folder), "No journal: no journal files in " + folder);
 
-  const std::string file = write("system.journal", "", 0);
+  const std::string file = folder + "/system.journal";
+  std::filesystem::create_symlink("/none", file);
+  EXPECT_EQ(prepareError(folder),
+            "Cannot read the journal: " + file + ": No such file or directory");
+  std::filesystem::remove(file);
+  write("system.journal", "", 0);
   const bool isRoot = geteuid() == 0;
   chmod(folder.c_str(), 0755);
   ASSERT_TRUE(!isRoot || seteuid(65534) == 0);

@@ -142,10 +142,12 @@ std::vector<JournalFile> openAll(const std::vector<fs::path>& paths) {
   std::vector<JournalFile> files;
   for (const fs::path& path : paths) {
     posix::Descriptor opened(::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
+    const std::error_code failure(errno, std::generic_category());
+    const bool isGone = failure == std::errc::no_such_file_or_directory && !fs::is_symlink(path);
     if (opened) {
       files.push_back({path, std::move(opened)});
-    } else if (errno != ENOENT) {
-      refuseUnreadable(path, {errno, std::generic_category()});
+    } else if (!isGone) {
+      refuseUnreadable(path, failure);
     }
   }
   return files;
