@@ -31,7 +31,10 @@ std::shared_ptr<CommandBase> ZUBShell::createRootCommand() {
     const dispatch::queue queue("zubtool.queue");
     const auto manager = zub::client::CreateManager("zubtool", queue);
     const auto group = dispatch::group::create();
-    FollowServerState(manager, group);
+    {
+      const dispatch::membership own(group);
+      FollowServerState(manager, group);
+    }
     // If the library keeps the handler, the group stays open and the wait takes its full time. The
     // result does not matter: commands that need the server check its state.
     static_cast<void>(group.wait(kFirstStateWait));

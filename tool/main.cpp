@@ -32,9 +32,10 @@ extern "C" void* runShellThread(void* argument) {
   const auto& start = *static_cast<const Start*>(argument);
   pthread_sigmask(SIG_SETMASK, &start.signals, nullptr);
   try {
+    const auto commandLine = start.words;
     const std::shared_ptr<CommandShell> shell(
         new ZUBShell(platform::readEditedLine, platform::showWork));
-    const bool succeeded = shell->run(start.words);
+    const bool succeeded = shell->run(commandLine);
     std::exit(succeeded ? EXIT_SUCCESS : EXIT_FAILURE);  // with the shell and its tree alive
   } catch (const std::bad_alloc&) {
     std::cerr << "Not enough memory" << std::endl;
