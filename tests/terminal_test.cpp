@@ -3,11 +3,8 @@
 #include <gtest/gtest.h>
 
 #include <csignal>
-#include <iostream>
-#include <sstream>
 
 #include "fuzz/Typist.h"
-#include "tool/ZUBShell.h"
 
 namespace {
 
@@ -203,22 +200,6 @@ TEST_F(Terminal, IsReadAsBeforeWhereItsCursorDoesNotMove) {
     program->type("quit\n");
     expectEnd("", 0);
   }
-}
-
-TEST(Shell, ThatIsGivenNoEditorReadsTheStandardStreams) {
-  int terminal = -1;
-  const pid_t process = forkpty(&terminal, nullptr, nullptr, nullptr);
-  if (process == 0) {
-    alarm(60);
-    setenv("TERM", "xterm", 1);
-    std::stringbuf typed("quit\n");
-    std::cin.rdbuf(&typed);
-    _exit(ZUBShell().run({"zubtool"}) ? 7 : 8);
-  }
-  int status = 0;
-  waitpid(process, &status, 0);
-  EXPECT_EQ(WEXITSTATUS(status), 7);
-  close(terminal);
 }
 
 }  // namespace
