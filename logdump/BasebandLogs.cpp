@@ -1,5 +1,3 @@
-#include "logdump/BasebandLogs.h"
-
 #include <iostream>
 
 #include "logdump/LogdumpCommand.h"
@@ -116,8 +114,8 @@ bool Collect(const LogdumpCommand& node, const std::list<std::string>& words) {
 
 }  // namespace
 
-CommandHandler BasebandLogsHandler(const LogdumpCommand& node) {
-  return [&node](const dispatch::group&, const std::list<std::string>& words) {
-    return Collect(node, words);
+CommandHandler LogdumpCommand::basebandLogs() const {
+  return [this](const dispatch::group&, const std::list<std::string>& words) {
+    return Collect(*this, words);
   };
 }

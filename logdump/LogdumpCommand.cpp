@@ -2,9 +2,7 @@
 
 #include <iostream>
 
-#include "logdump/BasebandLogs.h"
 #include "logdump/OsLogCommand.h"
-#include "logdump/TelephonyLogs.h"
 #include "logdump/TraceProperty.h"
 #include "tool/ServerState.h"
 
@@ -26,12 +24,12 @@ bool LogdumpCommand::isAllowed(std::string name) {
 }
 
 void LogdumpCommand::registerCommands() {
-  addCommandHandler("tel", TelephonyLogsHandler(*this),
+  addCommandHandler("tel", telephonyLogs(),
                     "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs");
-  addCommandHandler("core", TelephonyLogsWithCoredumpHandler(*this),
+  addCommandHandler("core", telephonyLogsWithCoredump(),
                     "[nocompress|tar.gz|tar] [nonui] <reason> collect telephony logs with coredump",
                     "resets the baseband");
-  addCommandHandler("bb", BasebandLogsHandler(*this),
+  addCommandHandler("bb", basebandLogs(),
                     "[nocompress|tar.gz|tar] <reason> collect baseband logs only");
   addCommandHandler("oslog", OsLogHandler(),
                     "[history size] [output txt file path] -p <process1 process2..> -i "

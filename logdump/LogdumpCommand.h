@@ -25,4 +25,18 @@ class LogdumpCommand : public ZUBCommandBase {
  private:
   using ZUBCommandBase::ZUBCommandBase;
   void registerCommands() override;
+
+  /// The handler that asks the server to collect telephony logs. It sends the request and returns
+  /// true. When the reply arrives, it prints the outcome and, on success, the path, and leaves its
+  /// task group.
+  CommandHandler telephonyLogs() const;
+
+  /// The same with a core dump of the modem, which resets the baseband.
+  CommandHandler telephonyLogsWithCoredump() const;
+
+  /// The handler that asks the server to dump the baseband trace logs or, if no server runs, asks
+  /// the helper service where they are. Its requests are synchronous; it does not use its task
+  /// group. It returns false only if the query whether the trace is enabled fails; other failures
+  /// are printed.
+  CommandHandler basebandLogs() const;
 };

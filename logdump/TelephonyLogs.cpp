@@ -1,5 +1,3 @@
-#include "logdump/TelephonyLogs.h"
-
 #include <iostream>
 #include <new>
 
@@ -81,10 +79,8 @@ CommandHandler HandlerOf(const LogdumpCommand& node, const Collection& collectio
 
 }  // namespace
 
-CommandHandler TelephonyLogsHandler(const LogdumpCommand& node) {
-  return HandlerOf(node, kTelephony);
-}
+CommandHandler LogdumpCommand::telephonyLogs() const { return HandlerOf(*this, kTelephony); }
 
-CommandHandler TelephonyLogsWithCoredumpHandler(const LogdumpCommand& node) {
-  return HandlerOf(node, kTelephonyWithCoredump);
+CommandHandler LogdumpCommand::telephonyLogsWithCoredump() const {
+  return HandlerOf(*this, kTelephonyWithCoredump);
 }
