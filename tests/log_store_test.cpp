@@ -264,7 +264,6 @@ TEST_F(LogStore, DeliversWhatIsWantedInItsOrderAndEndsAsTheProfileSays) {
   delivered = run(stream(log), 4);  // stays open after the last event
   EXPECT_EQ(delivered.events.size(), 4);
   EXPECT_EQ(delivered.reason, kInvalidated);
-  EXPECT_EQ(run(stream(log), 2).events.size(), 2);
 }
 
 TEST_F(LogStore, ReadsOnWhileAnEventIsHandledUntilItIsInvalidatedOrThatFails) {
@@ -314,8 +313,7 @@ TEST_F(LogStore, HoldsTextsOfAnySizeAsLongAsTheyAreInHand) {
 TEST_F(LogStore, OutlivesEachAllocationOfAnExportThatFails) {
   const std::string fields = "_COMM=a-long-process-\n_EXE=/É/a-long-process-name\nMESSAGE=";
   const std::string message = std::string(300'000, 'm') + "\xFF and no more";
-  const std::string damaged = "the end, which is reported";
-  starve(write("log", kDate + fields + message + "\n\n" + damaged), 1);
+  starve(write("log", kDate + fields + message + "\n\nthe end, which is reported"), 1);
 }
 
 TEST_F(LogStore, NothingThatIsReadIsAnOutput) {
@@ -365,7 +363,6 @@ TEST_F(LogStore, SaysWhyItCannotBePrepared) {
                                       ": Permission denied. Run as "
                                       "root or as a member of the group systemd-journal");
   ASSERT_TRUE(!isRoot || seteuid(0) == 0);
-  chmod(file.c_str(), 0600);
 }
 
 /// Journal files, made of recorded logs by systemd's own program.
